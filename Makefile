@@ -1,0 +1,29 @@
+# The two commands a new machine needs: `make test` and `make demo`. Both install any
+# missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
+.PHONY: all setup test bench demo format clean
+
+all: test
+
+setup:
+	@bash scripts/setup-deps.sh
+
+test: setup
+	cmake --preset test
+	cmake --build --preset test
+	ctest --preset test
+
+bench: setup
+	cmake --preset release
+	cmake --build --preset release
+	./build/release/bench/droqbxml_bench
+
+demo: setup
+	cmake --preset release
+	cmake --build --preset release
+	./build/release/bench/droqbxml_bench --benchmark_filter=Escape/1
+
+format:
+	clang-format -i $$(git ls-files '*.cpp' '*.hpp')
+
+clean:
+	rm -rf build
