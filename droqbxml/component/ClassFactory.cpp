@@ -1,0 +1,56 @@
+// The table of creatable classes.
+#include "droqbxml/component/ClassFactory.hpp"
+
+#include <array>
+#include <memory>
+
+#include "droqbxml/diagnostics/ErrorNumbers.hpp"
+#include "droqbxml/diagnostics/clsAppPathAccess.hpp"
+#include "droqbxml/diagnostics/clsMyErr.hpp"
+#include "droqbxml/diagnostics/clsTrace.hpp"
+#include "droqbxml/qbxml/clsXmlStringEscaping.hpp"
+#include "droqbxml/runtime/ComError.hpp"
+
+namespace droqbxml {
+namespace {
+
+constexpr TextView kLibraryName = u"DroQbXml";
+
+struct CreatableClass {
+  TextView name;
+  Ref<Object> (*create)();
+};
+
+template <class T>
+Ref<Object> make() {
+  return std::make_shared<T>();
+}
+
+constexpr std::array<CreatableClass, 5> kClasses{{
+    {u"clsMyErr", &make<clsMyErr>},
+    {u"clsAppPathAccess", &make<clsAppPathAccess>},
+    {u"clsErrorNumbers", &make<clsErrorNumbers>},
+    {u"clsTrace", &make<clsTrace>},
+    {u"clsXmlStringEscaping", &make<clsXmlStringEscaping>},
+}};
+
+}  // namespace
+
+Ref<Object> CreateObject(TextView progId) {
+  const auto dot = progId.find(u'.');
+  if (dot != TextView::npos && equalsIgnoreCase(progId.substr(0, dot), kLibraryName)) {
+    const TextView name = progId.substr(dot + 1);
+    for (const auto& entry : kClasses) {
+      if (equalsIgnoreCase(entry.name, name)) return entry.create();
+    }
+  }
+  raiseRuntimeError(RuntimeError::kCantCreateObject);
+}
+
+std::vector<Text> RegisteredProgIds() {
+  std::vector<Text> ids;
+  for (const auto& entry : kClasses) ids.push_back(Text(kLibraryName) + u"." + Text(entry.name));
+  return ids;
+}
+
+}  // namespace droqbxml

@@ -1,0 +1,188 @@
+// Escaping and unescaping in time linear in the text.
+//
+// Unescaping replaces each decimal reference "&#d;" the scan meets by its character in
+// every place of the whole text at once, then goes on from just after the reference's
+// "&". Replacing only the reference at hand gives the same text as long as no replacement
+// character can take part in forming another reference ("&", "#", digits, ";"), because
+// every later copy of the reference is then met and replaced by the scan itself. The scan
+// therefore runs in one pass and falls back to the literal whole-text replacement only
+// when such a character appears.
+#include "droqbxml/qbxml/XmlEscaping.hpp"
+
+#include <string>
+
+#include "droqbxml/component/basGlobals.hpp"
+#include "droqbxml/runtime/Codepage.hpp"
+#include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/Numbers.hpp"
+
+namespace droqbxml {
+namespace {
+
+bool isDigit(char16_t c) { return c >= u'0' && c <= u'9'; }
+
+void appendEscaped(Text& out, char16_t c, bool useUnicode) {
+  const int32_t code = useUnicode ? static_cast<int32_t>(c) : ansiCode(c);
+  if (code >= 32 && code <= 126) {
+    switch (c) {
+      case u'\'':
+        out += u"&apos;";
+        return;
+      case u'"':
+        out += u"&quot;";
+        return;
+      case u'<':
+        out += u"&lt;";
+        return;
+      case u'>':
+        out += u"&gt;";
+        return;
+      case u'&':
+        out += u"&amp;";
+        return;
+      default:
+        out.push_back(c);
+        return;
+    }
+  }
+  out += u"&#";
+  const std::string digits = std::to_string(code);
+  out.append(digits.begin(), digits.end());
+  out.push_back(u';');
+}
+
+Text replaceAll(const Text& text, TextView what, TextView with) {
+  Text out;
+  out.reserve(text.size());
+  size_t from = 0;
+  for (size_t at = text.find(what); at != Text::npos; at = text.find(what, from)) {
+    out.append(text, from, at - from);
+    out.append(with);
+    from = at + what.size();
+  }
+  out.append(text, from, Text::npos);
+  return out;
+}
+
+// A decimal reference at `at` ("&#" known to be there): the digits and whether ";" ends
+// them.
+struct Reference {
+  TextView digits;
+  bool terminated;
+};
+
+Reference readReference(TextView text, size_t at) {
+  size_t end = at + 2;
+  while (end < text.size() && text[end] != u';' && isDigit(text[end])) ++end;
+  return {text.substr(at + 2, end - at - 2), end < text.size() && text[end] == u';'};
+}
+
+char16_t referenceCharacter(TextView digits, bool useUnicode) {
+  // "&#;" has no digits: the empty text does not convert (13).
+  const int32_t code = textToLong(digits);
+  return useUnicode ? unicodeChar(code) : ansiChar(code);
+}
+
+bool formsReferences(char16_t c) { return c == u'&' || c == u'#' || c == u';' || isDigit(c); }
+
+// The literal procedure: each reference met is replaced everywhere in the text.
+Text unescapeReferencesLiterally(Text text, bool useUnicode) {
+  size_t start = 0;
+  for (size_t at = text.find(u"&#", start); at != Text::npos; at = text.find(u"&#", start)) {
+    const Reference ref = readReference(text, at);
+    if (ref.terminated) {
+      const Text whole = u"&#" + Text(ref.digits) + u";";
+      const char16_t replacement = referenceCharacter(ref.digits, useUnicode);
+      text = replaceAll(text, whole, TextView(&replacement, 1));
+    }
+    start = at + 1;
+  }
+  return text;
+}
+
+// One pass; nullopt-like false when a replacement could form further references.
+bool unescapeReferencesInOnePass(const Text& text, bool useUnicode, Text& out) {
+  out.clear();
+  out.reserve(text.size());
+  size_t from = 0;
+  for (size_t at = text.find(u"&#"); at != Text::npos; at = text.find(u"&#", from)) {
+    const Reference ref = readReference(text, at);
+    if (!ref.terminated) {
+      out.append(text, from, at + 1 - from);  // keep the "&", go on after it
+      from = at + 1;
+      continue;
+    }
+    const char16_t replacement = referenceCharacter(ref.digits, useUnicode);
+    if (formsReferences(replacement)) return false;
+    out.append(text, from, at - from);
+    out.push_back(replacement);
+    from = at + 3 + ref.digits.size();
+  }
+  out.append(text, from, Text::npos);
+  return true;
+}
+
+}  // namespace
+
+Text XMLEscapeChar(TextView c, bool useUnicode) {
+  if (c.empty()) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
+  Text out;
+  appendEscaped(out, c[0], useUnicode);
+  return out;
+}
+
+Text XMLEscapeString(TextView s, bool useUnicode) {
+  Text out;
+  out.reserve(s.size() + s.size() / 8);
+  for (char16_t c : s) appendEscaped(out, c, useUnicode);
+  return out;
+}
+
+Text XMLEscapeText(const Text& s, const Variant& maxLen, bool useUnicode) {
+  const bool limited = !maxLen.isMissing();
+  size_t limit = 0;
+  TextView work = s;
+  if (limited) {
+    const int32_t requested = maxLen.toLong();
+    if (requested > 0) {
+      const Text kind = maxLen.typeName();
+      // Only an integer kind is a limit; any other kind refuses the text (deliberate).
+      if (!equalsIgnoreCase(kind, u"Long") && !equalsIgnoreCase(kind, u"Integer")) return {};
+      limit = static_cast<size_t>(requested);
+      work = work.substr(0, limit);
+    }
+  }
+  Text result = XMLEscapeString(work, useUnicode);
+  if (limited && result.size() > limit) {
+    result.resize(limit);
+    if (EndsInPartialEntity(result)) result = CutPartialEntity(result);
+  }
+  return result;
+}
+
+bool EndsInPartialEntity(TextView t) {
+  const auto amp = t.rfind(u'&');
+  return amp != TextView::npos && t.find(u';', amp + 1) == TextView::npos;
+}
+
+Text CutPartialEntity(TextView t) {
+  const auto amp = t.rfind(u'&');
+  if (amp == TextView::npos) return Text(t);
+  if (t.find(u';', amp + 1) == TextView::npos) return Text(t.substr(0, amp));
+  return Text(t);
+}
+
+Text XMLUnEscapeText(const Text& s, bool useUnicode) {
+  Text text = s;
+  for (const auto& row : basGlobals::EntityTable) {
+    if (text.find(row.entity) != Text::npos) {
+      text = replaceAll(text, row.entity, TextView(&row.character, 1));
+    }
+  }
+  if (text.find(u"&#") == Text::npos) return text;
+  Text out;
+  if (unescapeReferencesInOnePass(text, useUnicode, out)) return out;
+  return unescapeReferencesLiterally(std::move(text), useUnicode);
+}
+
+}  // namespace droqbxml
