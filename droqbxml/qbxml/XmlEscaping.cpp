@@ -23,6 +23,8 @@ bool isDigit(char16_t c) { return c >= u'0' && c <= u'9'; }
 
 void appendEscaped(Text& out, char16_t c, bool useUnicode) {
   const int32_t code = useUnicode ? static_cast<int32_t>(c) : ansiCode(c);
+  // A character the code page lacks has the code of "?", a printable code: it is written
+  // as it is, not as "?" or as a reference.
   if (code >= 32 && code <= 126) {
     switch (c) {
       case u'\'':

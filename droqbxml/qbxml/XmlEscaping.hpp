@@ -12,7 +12,8 @@
 namespace droqbxml {
 
 // One character: the five entities for ' " < > &, other codes 32..126 unchanged, every
-// other code as "&#" + decimal code + ";". Only the first character of the text counts;
+// other code as "&#" + decimal code + ";". A character outside the code page has the code
+// of "?" and so stays unchanged. Only the first character of the text counts;
 // an empty text is the runtime's 5.
 Text XMLEscapeChar(TextView c, bool useUnicode = false);
 Text XMLEscapeString(TextView s, bool useUnicode = false);

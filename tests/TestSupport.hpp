@@ -1,0 +1,101 @@
+// Helpers shared by the test suites: raised-error assertions, readable text, temporary
+// drive folders and file reading.
+#ifndef DROQBXML_TESTS_TESTSUPPORT_HPP_
+#define DROQBXML_TESTS_TESTSUPPORT_HPP_
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <iterator>
+#include <optional>
+#include <ostream>
+#include <string>
+#include <utility>
+
+#include <unistd.h>
+
+#include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/Text.hpp"
+#include "droqbxml/runtime/Utf.hpp"
+
+namespace droqbxml {
+
+// Lets GoogleTest print 16-bit text in failure messages.
+inline void PrintTo(const Text& text, std::ostream* os) { *os << '"' << toUtf8(text) << '"'; }
+
+namespace test {
+
+// Asserts that `body` raises a ComError with exactly this number, source and description.
+inline ::testing::AssertionResult raises(const std::function<void()>& body, int32_t number,
+                                         TextView source, TextView description) {
+  try {
+    body();
+  } catch (const ComError& error) {
+    if (error.number() == number && error.source() == source &&
+        error.description() == description) {
+      return ::testing::AssertionSuccess();
+    }
+    return ::testing::AssertionFailure()
+           << "raised " << error.number() << " from \"" << toUtf8(error.source()) << "\": \""
+           << toUtf8(error.description()) << "\"";
+  }
+  return ::testing::AssertionFailure() << "nothing was raised";
+}
+
+// Asserts that `body` raises the runtime's error `number` (source "DroQbXml").
+inline ::testing::AssertionResult raisesRuntime(const std::function<void()>& body,
+                                                int32_t number) {
+  return raises(body, number, u"DroQbXml", runtimeErrorDescription(number));
+}
+
+// A fresh folder standing for drive C: for the life of the object (DROQBXML_DRIVE_C).
+class TemporaryDrive {
+ public:
+  TemporaryDrive() {
+    const auto* info = ::testing::UnitTest::GetInstance()->current_test_info();
+    root_ = std::filesystem::temp_directory_path() /
+            ("droqbxml-test-" + std::to_string(::getpid()) + "-" +
+             (info ? std::string(info->test_suite_name()) + "." + info->name() : "x"));
+    std::filesystem::remove_all(root_);
+    std::filesystem::create_directories(root_);
+    if (const char* old = std::getenv("DROQBXML_DRIVE_C")) previous_ = old;
+    ::setenv("DROQBXML_DRIVE_C", root_.c_str(), 1);
+  }
+  ~TemporaryDrive() {
+    if (previous_) {
+      ::setenv("DROQBXML_DRIVE_C", previous_->c_str(), 1);
+    } else {
+      ::unsetenv("DROQBXML_DRIVE_C");
+    }
+    std::error_code ignored;
+    std::filesystem::remove_all(root_, ignored);
+  }
+  TemporaryDrive(const TemporaryDrive&) = delete;
+  TemporaryDrive& operator=(const TemporaryDrive&) = delete;
+
+  // The file-system path of a path below the drive, given with "/" separators.
+  std::filesystem::path path(const std::string& below) const { return root_ / below; }
+
+ private:
+  std::filesystem::path root_;
+  std::optional<std::string> previous_;
+};
+
+inline std::string readFile(const std::filesystem::path& path) {
+  std::ifstream in(path, std::ios::binary);
+  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+
+inline void writeFile(const std::filesystem::path& path, const std::string& bytes) {
+  std::ofstream out(path, std::ios::binary | std::ios::trunc);
+  out << bytes;
+}
+
+}  // namespace test
+}  // namespace droqbxml
+
+#endif  // DROQBXML_TESTS_TESTSUPPORT_HPP_

@@ -1,0 +1,121 @@
+// The escaper and unescaper, directly and through clsXmlStringEscaping by name.
+#include "droqbxml/qbxml/XmlEscaping.hpp"
+
+#include <gtest/gtest.h>
+
+#include <random>
+
+#include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/runtime/Codepage.hpp"
+#include "tests/TestSupport.hpp"
+
+namespace droqbxml {
+namespace {
+
+using test::raisesRuntime;
+
+Text escape(const Text& s, const Variant& maxLen = Variant::missing()) {
+  return XMLEscapeText(s, maxLen, false);
+}
+Text unescape(const Text& s) { return XMLUnEscapeText(s, false); }
+
+TEST(XmlEscapingTest, WritesEntitiesAndCodePageReferences) {
+  EXPECT_EQ(escape(u"Tom's \"A&B\" <1>"), u"Tom&apos;s &quot;A&amp;B&quot; &lt;1&gt;");
+  EXPECT_EQ(escape(u"a\tb\r\n"), u"a&#9;b&#13;&#10;");
+  EXPECT_EQ(escape(u"caf\u00e9 \u20ac \u007f"), u"caf&#233; &#128; &#127;");
+  // Not in the code page: its code is that of "?", a printable code, so it stays as it is.
+  EXPECT_EQ(escape(u"\u4e2d"), u"\u4e2d");
+  EXPECT_EQ(XMLEscapeString(u"\u4e2d\u20ac", true), u"&#20013;&#8364;");
+  EXPECT_EQ(XMLEscapeChar(u"<<", false), u"&lt;");
+  EXPECT_TRUE(raisesRuntime([] { XMLEscapeChar(u"", false); }, RuntimeError::kInvalidProcedureCall));
+  // Any code unit escapes: NUL, lone surrogates, U+FFFF.
+  const Text odd{char16_t{0}, char16_t{0xD800}, char16_t{0xFFFF}};
+  EXPECT_EQ(escape(odd), u"&#0;" + odd.substr(1));
+  EXPECT_EQ(XMLEscapeString(odd, true), u"&#0;&#55296;&#65535;");
+}
+
+TEST(XmlEscapingTest, LimitCountsOnlyForIntegerKindsAndDropsCutEntities) {
+  EXPECT_EQ(escape(u"AB&CD", 3), u"AB");
+  EXPECT_EQ(escape(u"AB&CD", int16_t{4}), u"AB");
+  EXPECT_EQ(escape(u"ABCDEF", 3), u"ABC");
+  EXPECT_EQ(escape(u"A\u00e9B", 3), u"A");  // "A&#233;" cut to "A&#" and dropped
+  EXPECT_EQ(escape(u"AB&CD", 100), u"AB&amp;CD");
+  // A limit that is not an integer kind refuses the text (hosts rely on this).
+  EXPECT_EQ(escape(u"ABCDEF", u"3"), u"");
+  EXPECT_EQ(escape(u"ABCDEF", 3.0), u"");
+  EXPECT_EQ(escape(u"ABC", 0), u"");
+  EXPECT_EQ(escape(u"ABC", -5), u"");
+  EXPECT_EQ(escape(u"ABC", u"0"), u"");
+  EXPECT_EQ(escape(u"ABC"), u"ABC");
+  EXPECT_TRUE(raisesRuntime([] { escape(u"ABC", u"x"); }, RuntimeError::kTypeMismatch));
+}
+
+TEST(XmlEscapingTest, PartialEntities) {
+  EXPECT_TRUE(EndsInPartialEntity(u"AB&am"));
+  EXPECT_FALSE(EndsInPartialEntity(u"AB&amp;"));
+  EXPECT_FALSE(EndsInPartialEntity(u"AB"));
+  EXPECT_TRUE(EndsInPartialEntity(u"&"));
+  EXPECT_EQ(CutPartialEntity(u"AB&am"), u"AB");
+  EXPECT_EQ(CutPartialEntity(u"&lt;AB&#2"), u"&lt;AB");
+  EXPECT_EQ(CutPartialEntity(u"AB&amp;"), u"AB&amp;");
+}
+
+TEST(XmlEscapingTest, UnescapesEntitiesThenDecimalReferences) {
+  EXPECT_EQ(unescape(u"&amp;lt;"), u"&lt;");
+  EXPECT_EQ(unescape(u"&#65;&#66;"), u"AB");
+  EXPECT_EQ(unescape(u"&#x41;"), u"&#x41;");
+  EXPECT_EQ(unescape(u"a &amp b"), u"a &amp b");
+  EXPECT_EQ(unescape(u"&nbsp;&copy;&#65"), u"&nbsp;&copy;&#65");
+  EXPECT_EQ(unescape(u"&apos;&quot;&lt;&gt;&amp;"), u"'\"<>&");
+  EXPECT_EQ(unescape(u"&#0065;&#128;&#233;"), u"A\u20ac\u00e9");
+  EXPECT_EQ(XMLUnEscapeText(u"&#8364;&#65535;", true), u"\u20ac\uffff");
+  EXPECT_EQ(unescape(u"&#0;"), Text(1, char16_t{0}));
+}
+
+TEST(XmlEscapingTest, ReplacesEachReferenceEverywhereWhenMet) {
+  // "&#38;" becomes "&" everywhere at once; the "&#65;" it forms is before the scan and
+  // stays, unless a later "&#65;" is met and replaced everywhere.
+  EXPECT_EQ(unescape(u"&#38;#65;"), u"&#65;");
+  EXPECT_EQ(unescape(u"&#38;#65;&#65;"), u"AA");
+  EXPECT_EQ(unescape(u"&#6&#53;;"), u"&#65;");
+  EXPECT_EQ(unescape(u"x&#59;&#59;"), u"x;;");
+}
+
+TEST(XmlEscapingTest, UnescapingFailsOnEmptyAndImpossibleReferences) {
+  EXPECT_TRUE(raisesRuntime([] { unescape(u"a&#;b"); }, RuntimeError::kTypeMismatch));
+  EXPECT_TRUE(raisesRuntime([] { unescape(u"&#256;"); }, RuntimeError::kInvalidProcedureCall));
+  EXPECT_TRUE(raisesRuntime([] { XMLUnEscapeText(u"&#65536;", true); },
+                            RuntimeError::kInvalidProcedureCall));
+  EXPECT_TRUE(raisesRuntime([] { unescape(u"&#99999999999;"); }, RuntimeError::kOverflow));
+}
+
+TEST(XmlEscapingTest, EscapeThenUnescapeGivesTheTextBack) {
+  // For every text the code page can represent and that holds no "&#" of its own: a
+  // literal "&#65;" in the text is escaped to "&amp;#65;", which unescapes to "&#65;" and
+  // then to "A".
+  EXPECT_EQ(unescape(escape(u"&#65;")), u"A");
+  std::mt19937 random(20261121);
+  std::vector<char16_t> alphabet;
+  for (int code = 0; code < 256; ++code) alphabet.push_back(ansiChar(code));
+  for (const char16_t c : {u'&', u'#', u';', u'<', u'\'', u'"', u'1'}) {
+    alphabet.insert(alphabet.end(), 20, c);  // make entities and near-references common
+  }
+  for (int round = 0; round < 2000; ++round) {
+    Text text;
+    const auto length = random() % 40;
+    for (size_t i = 0; i < length; ++i) text.push_back(alphabet[random() % alphabet.size()]);
+    if (text.find(u"&#") != Text::npos) continue;
+    ASSERT_EQ(unescape(escape(text)), text) << toUtf8(text);
+  }
+}
+
+TEST(XmlEscapingTest, ReachableByNameThroughTheEscapingClass) {
+  const auto escaper = CreateObject(u"DroQbXml.clsXmlStringEscaping");
+  EXPECT_EQ(escaper->call(u"XMLEscape", {Variant(u"AB&CD"), Variant(3)}).toText(), u"AB");
+  EXPECT_EQ(escaper->call(u"XMLEscape", {Variant(u"ABCDEF"), Variant(u"3")}).toText(), u"");
+  EXPECT_EQ(escaper->call(u"xmlescape", {Variant(u"<a>")}).toText(), u"&lt;a&gt;");
+  EXPECT_EQ(escaper->call(u"XMLUnEscape", {Variant(u"&amp;lt;")}).toText(), u"&lt;");
+}
+
+}  // namespace
+}  // namespace droqbxml
