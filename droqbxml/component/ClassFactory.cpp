@@ -8,6 +8,9 @@
 #include "droqbxml/diagnostics/clsAppPathAccess.hpp"
 #include "droqbxml/diagnostics/clsMyErr.hpp"
 #include "droqbxml/diagnostics/clsTrace.hpp"
+#include "droqbxml/qbxml/DroXmlBuilder.hpp"
+#include "droqbxml/qbxml/DroXmlElement.hpp"
+#include "droqbxml/qbxml/basValidationsModule.hpp"
 #include "droqbxml/qbxml/clsXmlStringEscaping.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -26,12 +29,15 @@ Ref<Object> make() {
   return std::make_shared<T>();
 }
 
-constexpr std::array<CreatableClass, 5> kClasses{{
+constexpr std::array<CreatableClass, 8> kClasses{{
     {u"clsMyErr", &make<clsMyErr>},
     {u"clsAppPathAccess", &make<clsAppPathAccess>},
     {u"clsErrorNumbers", &make<clsErrorNumbers>},
     {u"clsTrace", &make<clsTrace>},
     {u"clsXmlStringEscaping", &make<clsXmlStringEscaping>},
+    {u"basValidations", &make<basValidationsModule>},
+    {u"DroXmlBuilder", &make<DroXmlBuilder>},
+    {u"DroXmlElement", &make<DroXmlElement>},
 }};
 
 }  // namespace
