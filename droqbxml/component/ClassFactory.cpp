@@ -4,6 +4,8 @@
 #include <array>
 #include <memory>
 
+#include "droqbxml/component/DroXmlProcessor.hpp"
+#include "droqbxml/connection/DroXmlSdkWrapper.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/diagnostics/clsAppPathAccess.hpp"
 #include "droqbxml/diagnostics/clsMyErr.hpp"
@@ -29,7 +31,8 @@ Ref<Object> make() {
   return std::make_shared<T>();
 }
 
-constexpr std::array<CreatableClass, 8> kClasses{{
+constexpr std::array<CreatableClass, 10> kClasses{{
+    {u"DroXmlProcessor", &make<DroXmlProcessor>},
     {u"clsMyErr", &make<clsMyErr>},
     {u"clsAppPathAccess", &make<clsAppPathAccess>},
     {u"clsErrorNumbers", &make<clsErrorNumbers>},
@@ -37,6 +40,7 @@ constexpr std::array<CreatableClass, 8> kClasses{{
     {u"clsXmlStringEscaping", &make<clsXmlStringEscaping>},
     {u"basValidations", &make<basValidationsModule>},
     {u"DroXmlBuilder", &make<DroXmlBuilder>},
+    {u"DroXmlSdkWrapper", &make<DroXmlSdkWrapper>},
     {u"DroXmlElement", &make<DroXmlElement>},
 }};
 

@@ -1,6 +1,8 @@
 // Trimming, ASCII case folding and search on 16-bit text.
 #include "droqbxml/runtime/Text.hpp"
 
+#include "droqbxml/runtime/ComError.hpp"
+
 namespace droqbxml {
 
 TextView trimView(TextView text) {
@@ -41,7 +43,8 @@ bool equalsIgnoreCase(TextView a, TextView b) {
 Text asciiText(std::string_view ascii) { return Text(ascii.begin(), ascii.end()); }
 
 int32_t inStr(int32_t start, TextView text, TextView what) {
-  if (start < 1 || static_cast<size_t>(start) > text.size() + 1) return 0;
+  if (start < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
+  if (static_cast<size_t>(start) > text.size() + 1) return 0;
   const auto found = text.find(what, static_cast<size_t>(start - 1));
   return found == TextView::npos ? 0 : static_cast<int32_t>(found + 1);
 }

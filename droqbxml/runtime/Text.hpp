@@ -27,7 +27,8 @@ bool equalsIgnoreCase(TextView a, TextView b);
 Text asciiText(std::string_view ascii);
 
 // 1-based search of the platform's InStr: the position of `what` at or after `start`
-// (1-based), 0 when absent. A start beyond the text gives 0.
+// (1-based), 0 when absent. A start beyond the text gives 0; a start below 1 is the
+// runtime's 5.
 int32_t inStr(int32_t start, TextView text, TextView what);
 
 }  // namespace droqbxml

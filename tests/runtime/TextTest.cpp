@@ -26,6 +26,7 @@ TEST(TextTest, InStrIsOneBased) {
   EXPECT_EQ(inStr(4, u"abcabc", u"c"), 6);
   EXPECT_EQ(inStr(7, u"abcabc", u"c"), 0);
   EXPECT_EQ(inStr(1, u"abc", u"x"), 0);
+  EXPECT_TRUE(test::raisesRuntime([] { inStr(0, u"abc", u"a"); }, RuntimeError::kInvalidProcedureCall));
 }
 
 TEST(TextTest, Utf8EdgesReplaceWhatCannotConvert) {

@@ -1,0 +1,171 @@
+// The droqbxml command run in-process: argument handling, output and exit codes, against
+// a fake processor registered under a ProgID of its own.
+#include "cli/Cli.hpp"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+
+#include "droqbxml/connection/RequestProcessor.hpp"
+#include "tests/TestSupport.hpp"
+#include "tests/connection/FakeProcessor.hpp"
+
+namespace droqbxml {
+namespace {
+
+constexpr TextView kFakeProgId = u"Test.FakeProcessor";
+
+struct Result {
+  int code;
+  std::string out;
+  std::string err;
+};
+
+class CliTest : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    registerRequestProcessor(kFakeProgId, [f = fake_] { return f; });
+    unregisterRequestProcessor(kRequestProcessorProgId);
+  }
+  void TearDown() override { unregisterRequestProcessor(kFakeProgId); }
+
+  Result run(std::vector<std::string> args, const std::string& input = "") {
+    args.insert(args.begin(), "droqbxml");
+    std::vector<const char*> argv;
+    for (const auto& a : args) argv.push_back(a.c_str());
+    std::istringstream in(input);
+    std::ostringstream out;
+    std::ostringstream err;
+    const int code = cli::run(static_cast<int>(argv.size()), argv.data(), in, out, err);
+    return {code, out.str(), err.str()};
+  }
+  Result send(const std::vector<std::string>& extra, const std::string& input = "<request/>") {
+    std::vector<std::string> args{"--processor", "Test.FakeProcessor", "send", "-", "--company",
+                                  "C:\\co.qbw"};
+    args.insert(args.end(), extra.begin(), extra.end());
+    return run(args, input);
+  }
+
+  test::TemporaryDrive drive_;
+  std::shared_ptr<test::FakeProcessor> fake_ = std::make_shared<test::FakeProcessor>();
+};
+
+TEST_F(CliTest, EscapesAndUnescapes) {
+  EXPECT_EQ(run({"escape", "Tom's <A&B>"}).out, "Tom&apos;s &lt;A&amp;B&gt;\n");
+  EXPECT_EQ(run({"escape", "caf\xC3\xA9"}).out, "caf&#233;\n");
+  EXPECT_EQ(run({"unescape", "&amp;lt; &#65;"}).out, "&lt; A\n");
+  const Result bad = run({"unescape", "&#;"});
+  EXPECT_EQ(bad.code, cli::kExitNotSuccess);
+  EXPECT_NE(bad.err.find("Type mismatch"), std::string::npos);
+}
+
+TEST_F(CliTest, BuildsQueryDocuments) {
+  const Result all = run({"build", "query", "item-inventory"});
+  EXPECT_EQ(all.code, cli::kExitSuccess);
+  EXPECT_EQ(all.out,
+            "<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
+            ">\r\n<QBXML>\r\n\t<QBXMLMsgsRq onError=\"stopOnError\">\r\n\t\t<ItemInventoryQueryRq "
+            "requestID=\"2\" />\r\n\t</QBXMLMsgsRq>\r\n</QBXML>\n");
+  EXPECT_NE(run({"build", "query", "item", "--full-name", "Labor", "--item-kind", "service"})
+                .out.find("<ItemServiceQueryRq requestID=\"2\">\r\n\t\t\t<FullName>Labor</FullName>"),
+            std::string::npos);
+  EXPECT_NE(run({"build", "query", "customer", "--active", "all", "--from", "2004-01-01"})
+                .out.find("<ActiveStatus>All</ActiveStatus>\r\n\t\t\t<FromModifiedDate>2004-01-01<"),
+            std::string::npos);
+  EXPECT_NE(run({"build", "query", "ACCOUNT", "--list-id", " 80000001-1 "})
+                .out.find("<CustomerQueryRq requestID=\"2\">\r\n\t\t\t<ListID>80000001-1</ListID>"),
+            std::string::npos);
+}
+
+TEST_F(CliTest, RefusesBadArgumentsWithUsageCode) {
+  for (const std::vector<std::string>& args : std::vector<std::vector<std::string>>{
+           {},
+           {"frobnicate"},
+           {"build"},
+           {"build", "query", "vendor"},
+           {"build", "query", "item", "--full-name", "X"},
+           {"build", "query", "customer", "--from", "2004-01-01"},
+           {"build", "query", "customer", "--full-name", "A", "--list-id", "B"},
+           {"build", "query", "customer", "--active", "sometimes"},
+           {"send"},
+       }) {
+    const Result result = run(args);
+    EXPECT_EQ(result.code, cli::kExitUsage) << ::testing::PrintToString(args);
+    EXPECT_FALSE(result.err.empty());
+  }
+  const Result help = run({"query", "--help"});
+  EXPECT_EQ(help.code, cli::kExitSuccess);
+  EXPECT_NE(help.out.find("--item-kind"), std::string::npos);
+}
+
+TEST_F(CliTest, SendsARequestAndReportsTheStatus) {
+  const Result ok = send({}, "\xEF\xBB\xBF<request/>");
+  EXPECT_EQ(ok.code, cli::kExitSuccess) << ok.err;
+  EXPECT_EQ(ok.out,
+            "<QBXML><QBXMLMsgsRs><X statusCode=\"0\" /></QBXMLMsgsRs></QBXML>\n"
+            "Response status: RSSuccess (0)\n");
+  EXPECT_EQ(fake_->calls,
+            (std::vector<std::string>{"OpenConnection(4093-27-,Tessaly)", "BeginSession(C:\\co.qbw,2)",
+                                      "ProcessRequest(ticket-1)", "EndSession(ticket-1)",
+                                      "CloseConnection"}));
+
+  fake_->process = [](const Text&) { return Text(u"<Rs statusCode=\"1\"/>\n"); };
+  const Result none = send({});
+  EXPECT_EQ(none.code, cli::kExitNotSuccess);
+  EXPECT_EQ(none.out, "<Rs statusCode=\"1\"/>\nResponse status: RSNoMatch (1)\n");
+
+  const Result empty = send({}, "  ");
+  EXPECT_EQ(empty.code, cli::kExitNotSuccess);
+  EXPECT_NE(empty.err.find("the request document is empty"), std::string::npos);
+  EXPECT_EQ(empty.out, "Response status: RSUnknown (-10)\n");
+}
+
+TEST_F(CliTest, QueriesThroughTheBuilderWithTheHostsIdentity) {
+  Text sent;
+  fake_->process = [&](const Text& request) {
+    sent = request;
+    return Text(u"<Rs statusCode=\"0\"/>");
+  };
+  const Result result = run({"--processor", "Test.FakeProcessor", "--app-name", "Job Costing",
+                             "--app-id", "1111-22-", "query", "customer", "--full-name", "A&B",
+                             "--company", "C:\\co.qbw"});
+  EXPECT_EQ(result.code, cli::kExitSuccess) << result.err;
+  EXPECT_EQ(fake_->calls.front(), "OpenConnection(1111-22-,Job Costing)");
+  EXPECT_NE(sent.find(u"<FullName>A&amp;B</FullName>"), Text::npos);
+}
+
+TEST_F(CliTest, ConnectionAndSessionFailuresExitWith3) {
+  const Result noProcessor = run({"send", "-", "--company", "C:\\co.qbw"}, "<r/>");
+  EXPECT_EQ(noProcessor.code, cli::kExitConnection);
+  EXPECT_NE(noProcessor.err.find("no request processor is available"), std::string::npos);
+  EXPECT_EQ(run({"--processor", "No.Such", "send", "-"}, "<r/>").code, cli::kExitConnection);
+
+  const Result noCompany = run({"--processor", "Test.FakeProcessor", "send", "-"}, "<r/>");
+  EXPECT_EQ(noCompany.code, cli::kExitConnection);
+  EXPECT_NE(noCompany.err.find("RSUnsetCoFile (23000)"), std::string::npos);
+
+  fake_->begin = [](const Text&) -> Text {
+    throw test::processorError(static_cast<int32_t>(0x80040403),
+                               u"Could not open the specified QuickBooks company data file.");
+  };
+  const Result missing = send({});
+  EXPECT_EQ(missing.code, cli::kExitConnection);
+  EXPECT_NE(missing.err.find("Could not open the specified QuickBooks company data file."),
+            std::string::npos);
+
+  fake_->open = [] {
+    throw test::processorError(static_cast<int32_t>(0x80040401), u"Could not access QuickBooks.");
+  };
+  EXPECT_EQ(send({}).code, cli::kExitConnection);
+}
+
+TEST_F(CliTest, UnreadableRequestFileIsAUsageError) {
+  const Result result = run({"--processor", "Test.FakeProcessor", "send",
+                             drive_.path("none.xml").string(), "--company", "C:\\co.qbw"});
+  EXPECT_EQ(result.code, cli::kExitUsage);
+  EXPECT_NE(result.err.find("cannot read the request document"), std::string::npos);
+  EXPECT_TRUE(fake_->calls.empty());
+}
+
+}  // namespace
+}  // namespace droqbxml
