@@ -3,7 +3,7 @@
 # machine lacks. Shared by the Makefile and .ci/run; does nothing when all are present.
 set -euo pipefail
 
-packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev)
+packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev)
 
 missing=()
 for p in "${packages[@]}"; do

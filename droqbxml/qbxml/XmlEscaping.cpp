@@ -174,13 +174,32 @@ Text CutPartialEntity(TextView t) {
   return Text(t);
 }
 
-Text XMLUnEscapeText(const Text& s, bool useUnicode) {
-  Text text = s;
-  for (const auto& row : basGlobals::EntityTable) {
-    if (text.find(row.entity) != Text::npos) {
-      text = replaceAll(text, row.entity, TextView(&row.character, 1));
+// The five entities replaced in one pass. Replacing them row by row, each in the whole
+// text, gives the same result: no replacement character can complete or break another
+// entity, so only the order among overlapping candidates could matter, and entities do
+// not overlap.
+Text replaceEntities(const Text& s) {
+  Text out;
+  out.reserve(s.size());
+  size_t from = 0;
+  for (size_t at = s.find(u'&'); at != Text::npos; at = s.find(u'&', at + 1)) {
+    const TextView rest = TextView(s).substr(at);
+    for (const auto& row : basGlobals::EntityTable) {
+      if (rest.starts_with(row.entity)) {
+        out.append(s, from, at - from);
+        out.push_back(row.character);
+        from = at + row.entity.size();
+        at = from - 1;
+        break;
+      }
     }
   }
+  out.append(s, from, Text::npos);
+  return out;
+}
+
+Text XMLUnEscapeText(const Text& s, bool useUnicode) {
+  Text text = replaceEntities(s);
   if (text.find(u"&#") == Text::npos) return text;
   Text out;
   if (unescapeReferencesInOnePass(text, useUnicode, out)) return out;

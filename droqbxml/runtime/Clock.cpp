@@ -53,7 +53,11 @@ LocalTime now() {
   if (fixedClock) return *fixedClock;
   const std::time_t t = std::time(nullptr);
   std::tm parts{};
+#ifdef _WIN32
+  localtime_s(&parts, &t);
+#else
   localtime_r(&t, &parts);
+#endif
   return LocalTime{parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday,
                    parts.tm_hour,        parts.tm_min,     parts.tm_sec};
 }

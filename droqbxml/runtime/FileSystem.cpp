@@ -37,6 +37,10 @@ bool isDriveRelativeRoot(TextView path) {
 }
 
 void ensureDrive(TextView path) {
+#ifdef _WIN32
+  (void)path;  // real drives: nothing to create
+  return;
+#endif
   if (!hasDrive(path) && !isDriveRelativeRoot(path)) return;
   std::error_code ignored;
   std::filesystem::create_directories(driveRoot(hasDrive(path) ? path[0] : u'C'), ignored);
@@ -113,7 +117,12 @@ TextFile::TextFile(TextView path, OpenMode mode) {
     raiseRuntimeError(RuntimeError::kPathFileAccessError);
   }
   errno = 0;
+#ifdef _WIN32
+  // Windows paths are UTF-16; the narrow fopen would go through the ANSI code page.
+  std::FILE* file = _wfopen(mapped.c_str(), mode == OpenMode::Append ? L"ab" : L"wb");
+#else
   std::FILE* file = std::fopen(mapped.c_str(), mode == OpenMode::Append ? "ab" : "wb");
+#endif
   if (!file) raiseForErrno(errno);
   file_.reset(file);
 }
