@@ -3,7 +3,8 @@
 # machine lacks. Shared by the Makefile and .ci/run; does nothing when all are present.
 set -euo pipefail
 
-packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev)
+packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev
+  libsqlite3-dev libexpat1-dev libxml2-utils libpugixml-dev)
 
 missing=()
 for p in "${packages[@]}"; do

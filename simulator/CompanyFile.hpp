@@ -1,0 +1,80 @@
+// A company file of the stand-in: one SQLite database holding a QuickBooks company's lists,
+// transactions, settings and integrated-application list. Every change happens inside one
+// SQLite transaction, so a request lands whole or not at all, a process killed mid-request
+// leaves the file consistent, and two processes on one file do not corrupt it.
+#ifndef DROQBXML_SIMULATOR_COMPANYFILE_HPP_
+#define DROQBXML_SIMULATOR_COMPANYFILE_HPP_
+
+#include <cstdint>
+#include <filesystem>
+#include <functional>
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+
+struct sqlite3;
+
+namespace droqbxml::simulator {
+
+struct CompanySettings {
+  std::string companyName = "My Company";
+  bool salesTax = true;
+};
+
+struct ApplicationAccess {
+  bool allowed = true;
+  bool autoLogin = true;
+};
+
+// Why a company file could not be opened.
+class CompanyFileError : public std::runtime_error {
+ public:
+  enum class Kind { Missing, NotACompanyFile, Damaged, ReadOnly, Busy, AlreadyExists };
+  CompanyFileError(Kind kind, const std::string& what) : std::runtime_error(what), kind_(kind) {}
+  Kind kind() const noexcept { return kind_; }
+
+ private:
+  Kind kind_;
+};
+
+class CompanyFile {
+ public:
+  // Creates a new company file with what a new QuickBooks company holds; refuses a path
+  // that exists (AlreadyExists).
+  static void create(const std::filesystem::path& path, const CompanySettings& settings);
+
+  // Opens an existing company file; throws CompanyFileError.
+  explicit CompanyFile(const std::filesystem::path& path);
+  ~CompanyFile();
+  CompanyFile(const CompanyFile&) = delete;
+  CompanyFile& operator=(const CompanyFile&) = delete;
+
+  const std::filesystem::path& path() const noexcept { return path_; }
+  sqlite3* db() const noexcept { return db_; }
+  CompanySettings settings() const;
+
+  // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting for
+  // another process's transaction to end); rolls back and rethrows when `work` throws.
+  void inTransaction(const std::function<void()>& work);
+
+  // The next value of a named counter kept in the file (1, 2, ...), for list and
+  // transaction identifiers and numbers. Call it inside a transaction.
+  int64_t nextCounter(std::string_view counter);
+
+  // The integrated-application list: nothing for an application the file has not seen.
+  std::optional<ApplicationAccess> application(std::string_view appName) const;
+  void setApplication(std::string_view appName, const ApplicationAccess& access);
+
+  // A few lines describing the file: company name, sales tax, counts of each list and
+  // transaction kind, integrated applications.
+  std::string summary() const;
+
+ private:
+  std::filesystem::path path_;
+  sqlite3* db_ = nullptr;
+};
+
+}  // namespace droqbxml::simulator
+
+#endif  // DROQBXML_SIMULATOR_COMPANYFILE_HPP_
