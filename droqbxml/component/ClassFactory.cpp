@@ -14,6 +14,11 @@
 #include "droqbxml/qbxml/DroXmlElement.hpp"
 #include "droqbxml/qbxml/basValidationsModule.hpp"
 #include "droqbxml/qbxml/clsXmlStringEscaping.hpp"
+#include "droqbxml/records/DroAddress.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/records/DroCustomerCol.hpp"
+#include "droqbxml/records/DroObjRef.hpp"
+#include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
 namespace droqbxml {
@@ -31,7 +36,7 @@ Ref<Object> make() {
   return std::make_shared<T>();
 }
 
-constexpr std::array<CreatableClass, 10> kClasses{{
+constexpr std::array<CreatableClass, 14> kClasses{{
     {u"DroXmlProcessor", &make<DroXmlProcessor>},
     {u"clsMyErr", &make<clsMyErr>},
     {u"clsAppPathAccess", &make<clsAppPathAccess>},
@@ -42,6 +47,10 @@ constexpr std::array<CreatableClass, 10> kClasses{{
     {u"DroXmlBuilder", &make<DroXmlBuilder>},
     {u"DroXmlSdkWrapper", &make<DroXmlSdkWrapper>},
     {u"DroXmlElement", &make<DroXmlElement>},
+    {u"DroObjRef", &make<DroObjRef>},
+    {u"DroAddress", &make<DroAddress>},
+    {u"DroCustomer", &make<DroCustomer>},
+    {u"DroCustomerCol", &make<DroCustomerCol>},
 }};
 
 }  // namespace
@@ -53,6 +62,9 @@ Ref<Object> CreateObject(TextView progId) {
     for (const auto& entry : kClasses) {
       if (equalsIgnoreCase(entry.name, name)) return entry.create();
     }
+    for (const auto typedRef : typedRefClassNames()) {
+      if (equalsIgnoreCase(typedRef, name)) return createTypedRef(typedRef);
+    }
   }
   raiseRuntimeError(RuntimeError::kCantCreateObject);
 }
@@ -60,6 +72,9 @@ Ref<Object> CreateObject(TextView progId) {
 std::vector<Text> RegisteredProgIds() {
   std::vector<Text> ids;
   for (const auto& entry : kClasses) ids.push_back(Text(kLibraryName) + u"." + Text(entry.name));
+  for (const auto typedRef : typedRefClassNames()) {
+    ids.push_back(Text(kLibraryName) + u"." + Text(typedRef));
+  }
   return ids;
 }
 

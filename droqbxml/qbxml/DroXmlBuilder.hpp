@@ -17,6 +17,9 @@
 
 namespace droqbxml {
 
+class DroCustomer;
+class DroCustomerCol;
+
 class DroXmlBuilder final : public Object {
  public:
   static const ClassInfo& typeInfo();
@@ -91,6 +94,17 @@ class DroXmlBuilder final : public Object {
   // modification dates, trimmed and escaped but not checked.
   void BuildQueryByActiveOrDate(udEntityType entity, udActiveStatus active,
                                 const Text& fromDate = {}, const Text& toDate = {});
+
+  // The customer-info text of a collection: a customer query response holding, for each
+  // customer, its file name, names, company, bill address and job name. The message-set
+  // end tag comes out as "<QBXMLMsgsRs>" (its slash is dropped): hosts read it back only
+  // through ParseCustInfo, and the text is kept exactly so.
+  void BuildRetCustomerInfo(const Ref<DroCustomerCol>& oCustColA);
+  void BuildRetCustomerInfo(const DroCustomerCol& oCustColA);
+  // The request adding one customer, or one job (a customer with a ParentRef); the record's
+  // RequestID becomes the request's identifier.
+  void BuildAddCustomer(const Ref<DroCustomer>& cust);
+  void BuildAddJob(const Ref<DroCustomer>& Job);
 
   // True when the first "requestID=" of the response carries ReqID (any id when ReqID is
   // empty) and the first "statusCode=" after it is "0". A status code without a closing

@@ -10,6 +10,8 @@
 
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/records/DroCustomerCol.hpp"
 #include "droqbxml/runtime/Binding.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -70,6 +72,10 @@ const ClassInfo& DroXmlBuilder::typeInfo() {
         .getter(u"RequestID", &B::RequestID)
         .method(u"RequestIDUp", &B::RequestIDUp)
         .method(u"CreateElement", &B::CreateElement)
+        .method(u"BuildRetCustomerInfo",
+                static_cast<void (B::*)(const Ref<DroCustomerCol>&)>(&B::BuildRetCustomerInfo))
+        .method(u"BuildAddCustomer", &B::BuildAddCustomer)
+        .method(u"BuildAddJob", &B::BuildAddJob)
         .method(u"BuildQueryByAll", &B::BuildQueryByAll)
         .method(u"BuildQueryByFullName", &B::BuildQueryByFullName)
         .method(u"BuildQueryByListID", &B::BuildQueryByListID)

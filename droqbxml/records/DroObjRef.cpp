@@ -1,0 +1,35 @@
+// The generic reference record.
+#include "droqbxml/records/DroObjRef.hpp"
+
+#include "droqbxml/records/basCommonProcs.hpp"
+
+namespace droqbxml {
+
+const ClassInfo& DroObjRef::typeInfo() {
+  static const ClassInfo info = [] {
+    Members members;
+    members.getter(u"IsEmpty", &DroObjRef::IsEmpty);
+    addFieldMembers(members, kFields);
+    members.method(u"ParseRs", &DroObjRef::ParseRs).getter(u"PrintOut", &DroObjRef::PrintOut);
+    return ClassInfo(u"DroObjRef", members.take());
+  }();
+  return info;
+}
+
+void DroObjRef::fieldStored(size_t) { hasData_ = !ListID().empty() || !FullName().empty(); }
+
+void DroObjRef::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint,
+                        int32_t& EndPoint, bool Required, const Text& Parent) {
+  if (basCommonProcs::findInResponse(EndPoint, Value, u"<" + RefName + u">") == 0) return;
+  FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent + u"<" + RefName + u">");
+  reader.read(index<u"ListID">(), Required);
+  reader.read(index<u"FullName">(), Required);
+}
+
+Text DroObjRef::PrintOut() const {
+  DumpWriter dump(u"OBJECT REFERENCE");
+  dump.fields<u"ListID", u"FullName">(*this);
+  return dump.take();
+}
+
+}  // namespace droqbxml

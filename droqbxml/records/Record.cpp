@@ -1,0 +1,119 @@
+// The record engine: the set path, the late-bound field members, the dump writer.
+#include "droqbxml/records/Record.hpp"
+
+#include "droqbxml/qbxml/XmlEscaping.hpp"
+#include "droqbxml/qbxml/basValidations.hpp"
+
+namespace droqbxml {
+namespace {
+
+Text checked(const FieldSpec& spec, const Text& value) {
+  using namespace basValidations;
+  switch (spec.check) {
+    case Check::None:
+      return value;
+    case Check::Str: {
+      bool truncate = false;
+      return CheckSTRTYPE(value, static_cast<int16_t>(spec.arg), truncate);
+    }
+    case Check::Int: {
+      int32_t mode = spec.arg;
+      return CheckINTTYPE(value, mode, 0, 0);
+    }
+    case Check::Bool:
+      return CheckBOOLTYPE(value);
+    case Check::Date:
+      return CheckDATETYPE(value);
+    case Check::DateTime:
+      return CheckDATETIMETYPE(value);
+    case Check::Amt:
+      return CheckAMTTYPE(value);
+    case Check::Price:
+      return CheckPRICETYPE(value);
+    case Check::Quan:
+      return CheckQUANTYPE(value);
+    case Check::Percent:
+      return CheckPERCENTTYPE(value);
+    case Check::Id:
+      return CheckIDTYPE(value);
+    case Check::JobStatus:
+      return CheckJobStatus(value);
+    case Check::AccountType:
+      return CheckAccountType(value);
+    case Check::WageType:
+      return CheckWageType(value);
+  }
+  return value;
+}
+
+}  // namespace
+
+Record::Record(std::span<const FieldSpec> fields) : fields_(fields), values_(fields.size()) {}
+
+Text Record::fieldValueUnescaped(size_t index) const {
+  return XMLUnEscapeText(values_[index], false);
+}
+
+void Record::setFieldValue(size_t index, const Text& value) {
+  const FieldSpec& spec = fields_[index];
+  if (spec.rule == Rule::KeepsStoredValue) {
+    fieldStored(index);
+    return;
+  }
+  const Text trimmed = spec.trim == Trim::Spaces ? trim(value) : value;
+  const Text result = checked(spec, trimmed);
+  if (spec.rule == Rule::Specific) {
+    applyRule(index, result);
+  } else {
+    values_[index] = result;
+  }
+  fieldStored(index);
+}
+
+void Record::applyRule(size_t index, const Text& checkedValue) { values_[index] = checkedValue; }
+
+void Record::fieldStored(size_t) {}
+
+void Record::addFieldMembers(Members& members, std::span<const FieldSpec> fields) {
+  for (size_t i = 0; i < fields.size(); ++i) {
+    const Text name(fields[i].name);
+    if (fields[i].unescaped) {
+      members.custom(name + u"_XmlUnEscaped", MemberKind::Get, [i](Object& self, Arguments) {
+        return Variant(static_cast<Record&>(self).fieldValueUnescaped(i));
+      });
+    }
+    members.custom(name, MemberKind::Get, [i](Object& self, Arguments) {
+      return Variant(static_cast<Record&>(self).fieldValue(i));
+    });
+    members.custom(name, MemberKind::Let, [i](Object& self, Arguments args) {
+      if (args.size() != 1) binding::wrongArgumentCount();
+      static_cast<Record&>(self).setFieldValue(i, args[0].toText());
+      return Variant();
+    });
+  }
+}
+
+void DumpWriter::field(TextView label, const Text& value) {
+  text_ += u"\r\n";
+  text_ += label;
+  text_ += u"\r\n\t";
+  text_ += value;
+}
+
+void DumpWriter::untabbed(TextView label, const Text& value) {
+  text_ += u"\r\n";
+  text_ += label;
+  text_ += u"\r\n";
+  text_ += value;
+}
+
+void DumpWriter::block(TextView openingLabel, const Text& dump, TextView closingLabel) {
+  text_ += u"\r\n";
+  text_ += openingLabel;
+  text_ += u"\r\n";
+  text_ += dump;
+  text_ += u"\r\n";
+  text_ += closingLabel;
+}
+
+}  // namespace droqbxml

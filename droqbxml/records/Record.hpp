@@ -1,0 +1,204 @@
+// The record engine. A record class declares its text fields once, as a constexpr table of
+// rows in interface order (name, trim rule, check, check argument, whether it has an
+// "_XmlUnEscaped" twin, and a named setter rule where the setter does something unusual).
+// The engine does the rest: trimming, checking and storing on set, the late-bound members
+// (getter, setter, unescaped getter) derived from the table, and the reading and printing
+// helpers through which each record writes its own parse and dump orders, naming fields
+// by their table names (checked when compiled).
+#ifndef DROQBXML_RECORDS_RECORD_HPP_
+#define DROQBXML_RECORDS_RECORD_HPP_
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <vector>
+
+#include "droqbxml/runtime/Binding.hpp"
+#include "droqbxml/runtime/Object.hpp"
+#include "droqbxml/runtime/Text.hpp"
+
+namespace droqbxml {
+
+enum class Trim : uint8_t { None, Spaces };
+
+// The value check a setter applies after trimming (see basValidations); arg is the maximum
+// length for Str (0: none) and the mode for Int.
+enum class Check : uint8_t {
+  None,
+  Str,
+  Int,
+  Bool,
+  Date,
+  DateTime,
+  Amt,
+  Price,
+  Quan,
+  Percent,
+  Id,
+  JobStatus,
+  AccountType,
+  WageType
+};
+
+// Setters that do something besides trim, check and store. The engine runs the generic
+// ones; a record that uses a record-specific rule implements applyRule.
+enum class Rule : uint8_t {
+  None,
+  KeepsStoredValue,  // the argument is discarded: the field keeps what it holds
+  Specific,          // the record's own code (applyRule)
+};
+
+struct FieldSpec {
+  std::u16string_view name;
+  Trim trim = Trim::Spaces;
+  Check check = Check::None;
+  int32_t arg = 0;
+  bool unescaped = false;
+  Rule rule = Rule::None;
+};
+
+// A field name written in code, checked against the record's table when compiled.
+template <size_t N>
+struct FieldName {
+  char16_t chars[N]{};
+  constexpr FieldName(const char16_t (&text)[N]) {
+    for (size_t i = 0; i < N; ++i) chars[i] = text[i];
+  }
+  constexpr std::u16string_view view() const { return {chars, N - 1}; }
+};
+
+template <size_t K>
+consteval size_t fieldIndex(const std::array<FieldSpec, K>& fields, std::u16string_view name) {
+  for (size_t i = 0; i < K; ++i) {
+    if (fields[i].name == name) return i;
+  }
+  throw "no field of that name in this record";  // a compile-time error in a consteval call
+}
+
+// The base of every record with a field table: values, the set path and the late-bound
+// members of the fields.
+class Record : public Object {
+ public:
+  // The stored text of a field; its unescaped form.
+  const Text& fieldValue(size_t index) const { return values_[index]; }
+  Text fieldValueUnescaped(size_t index) const;
+  // Trim, check and store by the field's row; rules and the record's hooks apply.
+  void setFieldValue(size_t index, const Text& value);
+
+  std::span<const FieldSpec> fieldSpecs() const noexcept { return fields_; }
+
+ protected:
+  explicit Record(std::span<const FieldSpec> fields);
+
+  // Stores a value as it is, bypassing trim, check and rules.
+  void storeField(size_t index, Text value) { values_[index] = std::move(value); }
+  // A record-specific setter rule: given the checked value, stores what it must.
+  virtual void applyRule(size_t index, const Text& checked);
+  // Called after every store through setFieldValue.
+  virtual void fieldStored(size_t index);
+
+  // Appends, in table order, each field's late-bound members: "Name_XmlUnEscaped" (get)
+  // where the row says so, then "Name" (get, let).
+  static void addFieldMembers(Members& members, std::span<const FieldSpec> fields);
+
+ private:
+  std::span<const FieldSpec> fields_;
+  std::vector<Text> values_;
+};
+
+// Typed access to a record's fields by table name: Derived::kFields is its table.
+template <class Derived>
+class RecordOf : public Record {
+ public:
+  template <FieldName Name>
+  static consteval size_t index() {
+    return fieldIndex(Derived::kFields, Name.view());
+  }
+  template <FieldName Name>
+  const Text& field() const {
+    return fieldValue(index<Name>());
+  }
+  template <FieldName Name>
+  Text fieldUnescaped() const {
+    return fieldValueUnescaped(index<Name>());
+  }
+  template <FieldName Name>
+  void setField(const Text& value) {
+    setFieldValue(index<Name>(), value);
+  }
+
+ protected:
+  RecordOf() : Record(Derived::kFields) {}
+};
+
+// Reads a record's fields from response text in the order the record names them, sharing
+// one StartPoint/EndPoint pair with its sub-records; each value goes through its setter.
+template <class Derived>
+class FieldReader {
+ public:
+  FieldReader(Derived& record, const Text& value, int32_t& startPoint, int32_t& endPoint,
+              Text parent = {})
+      : record_(record),
+        value_(value),
+        start_(startPoint),
+        end_(endPoint),
+        parent_(std::move(parent)) {}
+
+  // Each a required element: an empty one raises, naming the parent path.
+  template <FieldName... Names>
+  void required() {
+    (read(Derived::template index<Names>(), true), ...);
+  }
+  template <FieldName... Names>
+  void optional() {
+    (read(Derived::template index<Names>(), false), ...);
+  }
+  // Reads a field under another element name (a host-side field in customer-info text).
+  void read(size_t index, bool isRequired);
+
+ private:
+  Derived& record_;
+  const Text& value_;
+  int32_t& start_;
+  int32_t& end_;
+  Text parent_;
+};
+
+// Builds a text dump: the heading, then label and TAB-indented value lines and framed
+// sub-record blocks, CR LF between lines and none at the end.
+class DumpWriter {
+ public:
+  explicit DumpWriter(TextView heading) : text_(heading) {}
+  void field(TextView label, const Text& value);
+  // A field printed without the TAB before its value.
+  void untabbed(TextView label, const Text& value);
+  void block(TextView openingLabel, const Text& dump, TextView closingLabel);
+  template <FieldName... Names, class Derived>
+  void fields(const Derived& record) {
+    (field(Names.view(), record.template field<Names>()), ...);
+  }
+  Text take() { return std::move(text_); }
+
+ private:
+  Text text_;
+};
+
+}  // namespace droqbxml
+
+#include "droqbxml/records/basCommonProcs.hpp"
+
+namespace droqbxml {
+
+template <class Derived>
+void FieldReader<Derived>::read(size_t index, bool isRequired) {
+  const Text name(record_.fieldSpecs()[index].name);
+  record_.setFieldValue(index,
+                        basCommonProcs::getElementValue(value_, name, start_, end_, isRequired,
+                                                        isRequired ? parent_ : Text()));
+}
+
+}  // namespace droqbxml
+
+#endif  // DROQBXML_RECORDS_RECORD_HPP_

@@ -1,0 +1,220 @@
+// The customer record: reading query and add responses (real ones included), matching
+// responses by request identifier, its setter rules, its dump, and the customer-info
+// exchange of the collection.
+#include <gtest/gtest.h>
+
+#include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/diagnostics/ErrorNumbers.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/records/DroCustomerCol.hpp"
+#include "tests/TestSupport.hpp"
+
+namespace droqbxml {
+namespace {
+
+Text readShared(const std::string& name) {
+  return fromUtf8(test::readFile(std::string(DROQBXML_SHARED_DIR) + "/qbxml/responses/" + name));
+}
+Text readGolden(const std::string& name) {
+  return fromUtf8(test::readFile(std::string(DROQBXML_TESTDATA_DIR) + "/records/" + name));
+}
+
+Text customerRet(const Text& name, const Text& extra = u"") {
+  return u"<CustomerRet><ListID>" + name +
+         u"-1</ListID><TimeCreated>2026-01-02T03:04:05-05:00"
+         u"</TimeCreated><TimeModified>2026-01-02T03:04:05-05:00</TimeModified><EditSequence>17"
+         u"</EditSequence><Name>" +
+         name + u"</Name><FullName>" + name +
+         u"</FullName><IsActive>"
+         u"true</IsActive><Sublevel>0</Sublevel>" +
+         extra + u"</CustomerRet>";
+}
+Text queryResponse(const Text& id, const Text& customers) {
+  return u"<CustomerQueryRs requestID=\"" + id +
+         u"\" statusCode=\"0\" statusSeverity=\"Info\" "
+         u"statusMessage=\"Status OK\">" +
+         customers + u"</CustomerQueryRs>";
+}
+
+TEST(DroCustomerTest, ReadsARealQueryResponse) {
+  const Text response = readShared("qbxml-gem__customer_query_rs.xml");
+  if (response.empty()) GTEST_SKIP() << "shared responses not found";
+  DroCustomer customer;
+  const int32_t cursor = customer.ParseRs(response);
+  EXPECT_EQ(customer.ListID(), u"10006-1211236622");
+  EXPECT_EQ(customer.EditSequence(), u"1213155356");
+  EXPECT_EQ(customer.BillAddress()->PostalCode(), u"06268");
+  EXPECT_EQ(customer.Fax(), u"");  // never read
+  // The phone stands after the ship address, so reading it moved the cursor past the ship
+  // address, whose tag is then searched from there and missed.
+  EXPECT_TRUE(customer.ShipAddress()->IsEmpty());
+  EXPECT_EQ(customer.SalesTaxCodeRef()->FullName(), u"Non");
+  EXPECT_EQ(customer.JobStatus(), u"None");
+  EXPECT_EQ(customer.PrintOut(), readGolden("customer_query_keith_palmer.txt"));
+  EXPECT_EQ(response.substr(static_cast<size_t>(cursor) - 1, 12), u"</JobStatus>");
+}
+
+TEST(DroCustomerTest, ReadsRealAddResponses) {
+  const Text add = readShared("qbxml-gem__customer_add_rs.xml");
+  if (add.empty()) GTEST_SKIP() << "shared responses not found";
+  DroCustomer customer;
+  customer.RequestID(u"15");
+  customer.ParseRs(add);
+  EXPECT_EQ(customer.Name(), u"20706 - Eastern XYZ University");
+  EXPECT_EQ(customer.BillAddress()->Addr3(), u"123 XYZ Road");
+  EXPECT_EQ(customer.Contact(), u"Keith Palmer");
+  // Amounts are stored as the "#.00" format writes them: zero has no leading digit.
+  EXPECT_EQ(customer.Balance(), u".00");
+  // A response without any requestID attribute is never read.
+  DroCustomer unread;
+  const Text withoutId = readShared("CustomerAddRs__qbwc-gem_test_helper.xml");
+  EXPECT_EQ(unread.ParseRs(withoutId, 5), 5);
+  EXPECT_EQ(unread.ListID(), u"");
+}
+
+TEST(DroCustomerTest, FindsItsResponseByRequestIdentifier) {
+  const Text batch = u"<QBXMLMsgsRs>" + queryResponse(u"6", customerRet(u"Six")) +
+                     queryResponse(u"7", customerRet(u"Seven")) + u"</QBXMLMsgsRs>";
+  DroCustomer seven;
+  seven.RequestID(u"7");
+  const int32_t cursor = seven.ParseRs(batch);
+  EXPECT_EQ(seven.Name(), u"Seven");
+  DroCustomer eight;
+  eight.RequestID(u"8");
+  EXPECT_GT(eight.ParseRs(batch), 1);
+  EXPECT_EQ(eight.Name(), u"");
+  // Records are read one after another across response elements...
+  DroCustomer first;
+  DroCustomer second;
+  second.ParseRs(batch, first.ParseRs(batch));
+  EXPECT_EQ(first.Name(), u"Six");
+  EXPECT_EQ(second.Name(), u"Seven");
+  // ...but a second customer inside the same response has no requestID after the first
+  // one's cursor, so it is not read.
+  const Text two = queryResponse(u"2", customerRet(u"A") + customerRet(u"B"));
+  DroCustomer a;
+  DroCustomer b;
+  const int32_t afterA = a.ParseRs(two);
+  EXPECT_EQ(b.ParseRs(two, afterA), afterA);
+  EXPECT_EQ(b.Name(), u"");
+  EXPECT_GT(cursor, 0);
+}
+
+TEST(DroCustomerTest, MissingRequiredElementKeepsWhatWasRead) {
+  const Text broken =
+      queryResponse(u"2",
+                    u"<CustomerRet><ListID>1</ListID><TimeCreated>t</TimeCreated><TimeModified>t"
+                    u"</TimeModified><Name>N</Name></CustomerRet>");
+  DroCustomer customer;
+  EXPECT_TRUE(test::raises([&] { customer.ParseRs(broken); }, PARING,
+                           u"DroQbXml.basCommonProcs.getElementValue",
+                           u"The response returned a an empty '<CustomerRet><EditSequence>'.\r\n"
+                           u"This element is not allowed to be empty."));
+  EXPECT_EQ(customer.ListID(), u"1");
+  EXPECT_EQ(customer.Name(), u"");
+  // A value its setter refuses raises from the parse too.
+  DroCustomer refused;
+  EXPECT_TRUE(test::raises(
+      [&] {
+        refused.ParseRs(queryResponse(u"2", customerRet(u"X", u"<JobStatus>Late</JobStatus>")));
+      },
+      JOB_STATUS, u"DroQbXml.basValidations.CheckJobStatus",
+      u"The value 'Late' is not an allowable job status value.  Please refer to the qbXML "
+      u"specifications."));
+}
+
+TEST(DroCustomerTest, SetterRules) {
+  DroCustomer customer;
+  customer.Notes(u"call first");  // discarded on purpose
+  EXPECT_EQ(customer.Notes(), u"");
+  customer.NonQbFileName(u" C:\\Jobs\\2026\\Smith.job ");
+  EXPECT_EQ(customer.NonQbFileName(), u" C:\\Jobs\\2026\\Smith.job ");
+  EXPECT_EQ(customer.NonQbFileTitle(), u"Smith.job");
+  customer.NonQbFileName(u"Jones.job");
+  EXPECT_EQ(customer.NonQbFileTitle(), u"Jones.job");
+  customer.NonQbCityStateZip(u" , ");
+  EXPECT_EQ(customer.NonQbCityStateZip(), u"");
+  customer.NonQbCityStateZip(u" Storrs, CT ");
+  EXPECT_EQ(customer.NonQbCityStateZip(), u" Storrs, CT ");
+  customer.JobDesc(u"  kept  ");
+  EXPECT_EQ(customer.JobDesc(), u"  kept  ");
+  customer.Name(u"  A &amp; B  ");
+  EXPECT_EQ(customer.Name(), u"A &amp; B");
+  EXPECT_EQ(customer.Name_XmlUnEscaped(), u"A & B");
+  customer.IsActive(u"1");
+  EXPECT_EQ(customer.IsActive(), u"true");
+  customer.CreditLimit(u"2000");
+  EXPECT_EQ(customer.CreditLimit(), u"2000.00");
+  EXPECT_EQ(DroCustomer().PrintOut(), readGolden("customer_new.txt"));
+}
+
+TEST(DroCustomerTest, ReachableByName) {
+  const auto customer = CreateObject(u"DroQbXml.DroCustomer");
+  customer->let(u"name", u" Kim ");
+  EXPECT_EQ(customer->get(u"Name_XmlUnEscaped").toText(), u"Kim");
+  customer->get(u"BillAddress").toObject()->let(u"City", u"Storrs");
+  EXPECT_NE(customer->get(u"PrintOut").toText().find(u"City\r\n\tStorrs"), Text::npos);
+  const Text response = queryResponse(u"2", customerRet(u"Lee"));
+  EXPECT_GT(customer->call(u"ParseRs", {Variant(response)}).toLong(), 0);
+  EXPECT_EQ(customer->get(u"FullName").toText(), u"Lee");
+  EXPECT_EQ(customer->get(u"DroCustomerCol").toObject()->get(u"Count").toLong(), 0);
+}
+
+TEST(DroCustomerColTest, CollectsCustomersByKey) {
+  DroCustomerCol col;
+  const auto kim = col.Add(u"K");
+  col.Add();
+  EXPECT_EQ(col.Count(), 2);
+  EXPECT_EQ(col.Item(Variant(u"k")), kim);
+  EXPECT_EQ(col.Item(Variant(1)), kim);
+  EXPECT_TRUE(test::raisesRuntime([&] { col.Add(u"K"); }, RuntimeError::kDuplicateKey));
+  EXPECT_TRUE(test::raisesRuntime([&] { col.Item(Variant(u"1")); },
+                                  RuntimeError::kInvalidProcedureCall));  // text is a key
+  col.Remove(Variant(u"K"));
+  EXPECT_EQ(col.Count(), 1);
+}
+
+TEST(DroCustomerColTest, CustomerInfoTextOfAnEmptyCollection) {
+  EXPECT_EQ(
+      DroCustomerCol().BuildCustInfoXML(),
+      u"<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
+      u">\r\n<QBXML>\r\n\t<QBXMLMsgsRs>\r\n\t\t<CustomerQueryRs requestID=\"2\" statusCode=\"0\" "
+      u"statusSeverity=\"INFO\" statusMessage=\"Status OK\">\r\n\t\t</CustomerQueryRs>\r\n"
+      u"\t<QBXMLMsgsRs>\r\n</QBXML>");
+}
+
+TEST(DroCustomerColTest, CustomerInfoRoundTripDropsDuplicateTitles) {
+  DroCustomerCol col;
+  const auto smith = col.Add();
+  smith->NonQbFileName(u"C:\\Jobs\\A\\Smith.job");
+  smith->FirstName(u"Ann");
+  smith->CompanyName(u"Smith & Sons");
+  smith->BillAddress()->City(u"Storrs");
+  smith->BillAddress()->State(u"CT");
+  smith->BillAddress()->PostalCode(u"06268");
+  smith->NonQbJobName(u"Kitchen");
+  const auto twin = col.Add();
+  twin->NonQbFileName(u"C:\\Jobs\\B\\Smith.job");
+  const auto jones = col.Add();
+  jones->NonQbFileName(u"Jones.job");
+  const Text text = col.BuildCustInfoXML();
+  EXPECT_NE(text.find(u"\t\t\t\t<CompanyName>Smith &amp; Sons</CompanyName>\r\n"), Text::npos);
+
+  DroCustomerCol back;
+  EXPECT_TRUE(back.ParseCustInfo(text));
+  ASSERT_EQ(back.Count(), 2);  // the second Smith.job is dropped without a word
+  const auto read = back.Item(Variant(u"KEYSmith.job"));
+  EXPECT_EQ(read->NonQbFileName(), u"C:\\Jobs\\A\\Smith.job");
+  EXPECT_EQ(read->FirstName(), u"Ann");
+  EXPECT_EQ(read->CompanyName(), u"Smith &amp; Sons");  // values keep their escaped form
+  EXPECT_EQ(read->NonQbJobName(), u"Kitchen");
+  EXPECT_EQ(read->NonQbCityStateZip(), u"Storrs, CT  06268");
+  EXPECT_EQ(back.Item(Variant(2))->NonQbFileTitle(), u"Jones.job");
+  DroCustomerCol unescaped;
+  EXPECT_TRUE(unescaped.ParseCustInfoUnEscaped(text));
+  EXPECT_EQ(unescaped.Item(Variant(1))->CompanyName(), u"Smith & Sons");
+  EXPECT_FALSE(DroCustomerCol().ParseCustInfo(u"<QBXML></QBXML>"));
+}
+
+}  // namespace
+}  // namespace droqbxml

@@ -1,0 +1,107 @@
+// getElementValue: its window for self-closing tags, its unbounded forward search, its
+// cursor, its empty-element error, and the tag index that keeps repeated searches cheap.
+#include <gtest/gtest.h>
+
+#include <random>
+
+#include "droqbxml/diagnostics/ErrorNumbers.hpp"
+#include "droqbxml/records/basCommonProcs.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
+#include "tests/TestSupport.hpp"
+
+namespace droqbxml {
+namespace {
+
+using basCommonProcs::getElementValue;
+
+struct Scan {
+  Text value;
+  int32_t start;
+  int32_t end;
+};
+
+Scan scan(const Text& text, const Text& name, int32_t cursor, bool required = false) {
+  int32_t start = -1;
+  int32_t end = cursor;
+  Text value = getElementValue(text, name, start, end, required, u"<CustomerRet>");
+  return {value, start, end};
+}
+
+TEST(basCommonProcsTest, ReadsContentAndMovesTheCursorToTheEndTag) {
+  const Text text = u"<a><Memo>x &amp; y</Memo><Memo>z</Memo></a>";
+  const Scan first = scan(text, u"Memo", 1);
+  EXPECT_EQ(first.value, u"x &amp; y");  // no unescaping
+  EXPECT_EQ(first.start, 10);
+  EXPECT_EQ(first.end, 19);
+  const Scan second = scan(text, u"Memo", first.end);
+  EXPECT_EQ(second.value, u"z");
+  // Absent: StartPoint takes the cursor, EndPoint stays.
+  const Scan absent = scan(text, u"Other", 5);
+  EXPECT_EQ(absent.value, u"");
+  EXPECT_EQ(absent.start, 5);
+  EXPECT_EQ(absent.end, 5);
+  // Case-sensitive, and a start tag with attributes is not the element.
+  EXPECT_EQ(scan(u"<listid>1</listid>", u"ListID", 1).value, u"");
+  EXPECT_EQ(scan(u"<ListID a=\"1\">1</ListID>", u"ListID", 1).value, u"");
+}
+
+TEST(basCommonProcsTest, SelfClosingTagsCountOnlyWithinTheWindow) {
+  for (const Text& tag : {Text(u"<Memo/>"), Text(u"<Memo />")}) {
+    const Scan near = scan(u"ab" + tag + u"<Memo>later</Memo>", u"Memo", 1, true);
+    EXPECT_EQ(near.value, u"");  // no error although required
+    EXPECT_EQ(near.start, 3);
+    EXPECT_EQ(near.end, static_cast<int32_t>(tag.size()) + 1);
+  }
+  // 120 characters away the empty form is missed and the later element is taken.
+  const Text far = Text(120, u' ') + u"<Memo/><Memo>later</Memo>";
+  EXPECT_EQ(scan(far, u"Memo", 1).value, u"later");
+  // The tag must lie wholly inside the 100 characters.
+  const Text straddling = Text(96, u' ') + u"<Memo/><Memo>later</Memo>";
+  EXPECT_EQ(scan(straddling, u"Memo", 1).value, u"later");
+}
+
+TEST(basCommonProcsTest, EmptyRequiredElementRaisesWithTheParentPath) {
+  const auto error = [](const Text& text) {
+    return test::raises([&] { scan(text, u"ListID", 1, true); }, PARING,
+                        u"DroQbXml.basCommonProcs.getElementValue",
+                        u"The response returned a an empty '<CustomerRet><ListID>'.\r\n"
+                        u"This element is not allowed to be empty.");
+  };
+  EXPECT_TRUE(error(u"<ListID></ListID>"));
+  EXPECT_TRUE(error(u"<Name>x</Name>"));
+  EXPECT_EQ(scan(u"<ListID></ListID>", u"ListID", 1).end, 9);
+}
+
+TEST(basCommonProcsTest, StartTagWithoutEndTagLeavesTheCursorAtZero) {
+  const Scan open = scan(u"<Name>cut off", u"Name", 1);
+  EXPECT_EQ(open.value, u"");
+  EXPECT_EQ(open.end, 0);
+  EXPECT_TRUE(test::raisesRuntime([&] { scan(u"<Name>cut off", u"Other", open.end); },
+                                  RuntimeError::kInvalidProcedureCall));
+}
+
+TEST(basCommonProcsTest, IndexedSearchFindsWhatAPlainSearchFinds) {
+  std::mt19937 random(7);
+  const std::u16string_view pieces[] = {u"<A>", u"</A>", u"<B>",  u"</B>", u"<A", u">",
+                                        u"x",   u"<",    u"<A><", u"<B/>", u"AB", u"\r\n"};
+  Text text;
+  while (text.size() < 100000) text += pieces[random() % std::size(pieces)];
+  for (int round = 0; round < 2000; ++round) {
+    const size_t from = random() % (text.size() + 10);
+    for (const TextView pattern : {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"),
+                                   TextView(u"<C>"), TextView(u"A><")}) {
+      ASSERT_EQ(internal::findForward(text, pattern, from), text.find(pattern, from))
+          << round << " " << toUtf8(Text(pattern));
+    }
+  }
+  // A tag the index points at that is no longer there sends the search back to the text.
+  const size_t first = text.find(u"<A>");
+  text.replace(first, 3, u"<C>");
+  EXPECT_EQ(internal::findForward(text, u"<A>", first), text.find(u"<A>", first));
+  // Another text is indexed on its own.
+  const Text other = text + u"<D>";
+  EXPECT_EQ(internal::findForward(other, u"<D>", 0), other.size() - 3);
+}
+
+}  // namespace
+}  // namespace droqbxml
