@@ -27,10 +27,12 @@ struct ApplicationAccess {
   bool autoLogin = true;
 };
 
-// Why a company file could not be opened.
+// Why a company file could not be created, opened or written. Unreadable: the path exists
+// but cannot be read (a folder, no read permission). Busy: another process held the file
+// for longer than the wait allowed.
 class CompanyFileError : public std::runtime_error {
  public:
-  enum class Kind { Missing, NotACompanyFile, Damaged, ReadOnly, Busy, AlreadyExists };
+  enum class Kind { Missing, NotACompanyFile, Damaged, ReadOnly, Busy, AlreadyExists, Unreadable };
   CompanyFileError(Kind kind, const std::string& what) : std::runtime_error(what), kind_(kind) {}
   Kind kind() const noexcept { return kind_; }
 
@@ -40,11 +42,16 @@ class CompanyFileError : public std::runtime_error {
 
 class CompanyFile {
  public:
-  // Creates a new company file with what a new QuickBooks company holds; refuses a path
-  // that exists (AlreadyExists).
+  // Creates a new company file with what a new QuickBooks company holds, all in one
+  // transaction. Refuses a path that exists (AlreadyExists), a missing folder (Missing) and a
+  // folder that cannot be written (ReadOnly); after any later failure the half-made file is
+  // removed and the failure rethrown.
   static void create(const std::filesystem::path& path, const CompanySettings& settings);
 
-  // Opens an existing company file; throws CompanyFileError.
+  // Opens an existing company file. Throws CompanyFileError: Missing, Unreadable,
+  // NotACompanyFile (not SQLite, or SQLite without the company-file marker), Damaged (SQLite's
+  // integrity check fails), ReadOnly (the file or its folder cannot be written: the stand-in
+  // must refuse at session begin what it could not change later), Busy.
   explicit CompanyFile(const std::filesystem::path& path);
   ~CompanyFile();
   CompanyFile(const CompanyFile&) = delete;
@@ -54,20 +61,24 @@ class CompanyFile {
   sqlite3* db() const noexcept { return db_; }
   CompanySettings settings() const;
 
-  // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting for
-  // another process's transaction to end); rolls back and rethrows when `work` throws.
+  // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting up to 10 s
+  // for another process's transaction to end); rolls back and rethrows when `work` throws.
+  // Called inside a transaction, it runs `work` in a savepoint that alone is undone on
+  // failure. SQLite failures are CompanyFileErrors (Busy, Damaged, ReadOnly) or
+  // std::runtime_errors.
   void inTransaction(const std::function<void()>& work);
 
   // The next value of a named counter kept in the file (1, 2, ...), for list and
   // transaction identifiers and numbers. Call it inside a transaction.
   int64_t nextCounter(std::string_view counter);
 
-  // The integrated-application list: nothing for an application the file has not seen.
+  // The integrated-application list, by exact application name: nothing for an application
+  // the file has not seen. setApplication adds or changes an entry in its own transaction.
   std::optional<ApplicationAccess> application(std::string_view appName) const;
   void setApplication(std::string_view appName, const ApplicationAccess& access);
 
-  // A few lines describing the file: company name, sales tax, counts of each list and
-  // transaction kind, integrated applications.
+  // A few lines describing the file: company name, sales tax, the number of rows of every
+  // list and transaction table, integrated applications.
   std::string summary() const;
 
  private:

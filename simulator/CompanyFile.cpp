@@ -1,0 +1,370 @@
+// The company file on SQLite: the stand-in's own tables (settings, counters, integrated
+// applications) beside the lists and transactions the request handlers keep. Opening checks,
+// in this order, that the file exists and can be read, is SQLite, carries the company-file
+// marker, passes SQLite's integrity check, and can be written.
+#include "simulator/CompanyFile.hpp"
+
+#include <fcntl.h>
+#include <sqlite3.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <memory>
+#include <system_error>
+#include <utility>
+
+#include "simulator/RequestHandlers.hpp"
+
+namespace droqbxml::simulator {
+namespace {
+
+using Kind = CompanyFileError::Kind;
+
+// Kept in the database header (PRAGMA application_id) and in the settings table, so that no
+// other SQLite database is taken for a company file.
+constexpr int32_t kApplicationId = 0x44515842;  // "DQXB"
+constexpr std::string_view kFormatMarker = "DroQbXml company file";
+constexpr int32_t kFormatVersion = 1;
+// How long a step waits for another process's transaction on the same file.
+constexpr int kBusyTimeoutMilliseconds = 10000;
+
+struct DatabaseCloser {
+  void operator()(sqlite3* db) const noexcept { sqlite3_close_v2(db); }
+};
+using Database = std::unique_ptr<sqlite3, DatabaseCloser>;
+
+std::string describe(const std::filesystem::path& path, std::string_view what) {
+  return "company file \"" + path.string() + "\": " + std::string(what);
+}
+
+[[noreturn]] void fail(Kind kind, const std::filesystem::path& path, std::string_view what) {
+  throw CompanyFileError(kind, describe(path, what));
+}
+
+// What a failed SQLite step means for the file: a CompanyFileError for the results that
+// say something about the file (locked, damaged, not writable), a runtime_error otherwise.
+[[noreturn]] void failSqlite(sqlite3* db, int result, std::string_view step) {
+  const char* message = db != nullptr ? sqlite3_errmsg(db) : sqlite3_errstr(result);
+  const std::string what = std::string(step) + ": " + message;
+  const char* file = db != nullptr ? sqlite3_db_filename(db, "main") : nullptr;
+  const std::filesystem::path path = file != nullptr ? file : "";
+  switch (result & 0xff) {
+    case SQLITE_BUSY:
+    case SQLITE_LOCKED:
+      fail(Kind::Busy, path, what);
+    case SQLITE_CORRUPT:
+      fail(Kind::Damaged, path, what);
+    case SQLITE_NOTADB:
+      fail(Kind::NotACompanyFile, path, what);
+    case SQLITE_READONLY:
+    case SQLITE_PERM:
+    case SQLITE_CANTOPEN:  // the main file is open already: a journal could not be created
+      fail(Kind::ReadOnly, path, what);
+    default:
+      throw std::runtime_error(describe(path, what));
+  }
+}
+
+void execute(sqlite3* db, const char* sql) {
+  const int result = sqlite3_exec(db, sql, nullptr, nullptr, nullptr);
+  if (result != SQLITE_OK) failSqlite(db, result, sql);
+}
+
+// One prepared statement; text is bound and read as UTF-8.
+class Statement {
+ public:
+  Statement(sqlite3* db, std::string_view sql) : db_(db) {
+    const int result =
+        sqlite3_prepare_v2(db, sql.data(), static_cast<int>(sql.size()), &statement_, nullptr);
+    if (result != SQLITE_OK) failSqlite(db, result, sql);
+  }
+  ~Statement() { sqlite3_finalize(statement_); }
+  Statement(const Statement&) = delete;
+  Statement& operator=(const Statement&) = delete;
+
+  Statement& bind(int index, std::string_view text) {
+    check(sqlite3_bind_text(statement_, index, text.data(), static_cast<int>(text.size()),
+                            SQLITE_TRANSIENT));
+    return *this;
+  }
+  Statement& bind(int index, int64_t value) {
+    check(sqlite3_bind_int64(statement_, index, value));
+    return *this;
+  }
+  // Runs to the next row: true when there is one, false when the statement is done.
+  bool step() {
+    const int result = sqlite3_step(statement_);
+    if (result == SQLITE_ROW) return true;
+    if (result == SQLITE_DONE) return false;
+    failSqlite(db_, result, sqlite3_sql(statement_));
+  }
+  std::string text(int column) const {
+    const auto* bytes = sqlite3_column_text(statement_, column);
+    return bytes != nullptr
+               ? std::string(reinterpret_cast<const char*>(bytes),
+                             static_cast<size_t>(sqlite3_column_bytes(statement_, column)))
+               : std::string();
+  }
+  int64_t integer(int column) const { return sqlite3_column_int64(statement_, column); }
+
+ private:
+  void check(int result) const {
+    if (result != SQLITE_OK) failSqlite(db_, result, sqlite3_sql(statement_));
+  }
+
+  sqlite3* db_;
+  sqlite3_stmt* statement_ = nullptr;
+};
+
+// Settings are kept as text under these keys.
+constexpr std::string_view kFormatKey = "format";
+constexpr std::string_view kCompanyNameKey = "company_name";
+constexpr std::string_view kSalesTaxKey = "sales_tax";
+
+std::string formatMarker() {
+  return std::string(kFormatMarker) + " " + std::to_string(kFormatVersion);
+}
+
+void writeOwnTables(sqlite3* db, const CompanySettings& settings) {
+  execute(db, ("PRAGMA application_id = " + std::to_string(kApplicationId)).c_str());
+  execute(db, ("PRAGMA user_version = " + std::to_string(kFormatVersion)).c_str());
+  execute(db,
+          "CREATE TABLE settings (key TEXT PRIMARY KEY NOT NULL, value TEXT NOT NULL);"
+          "CREATE TABLE counters (name TEXT PRIMARY KEY NOT NULL, value INTEGER NOT NULL);"
+          "CREATE TABLE integrated_applications (name TEXT PRIMARY KEY NOT NULL,"
+          " allowed INTEGER NOT NULL, auto_login INTEGER NOT NULL);");
+  const std::array<std::pair<std::string_view, std::string>, 3> rows{{
+      {kFormatKey, formatMarker()},
+      {kCompanyNameKey, settings.companyName},
+      {kSalesTaxKey, settings.salesTax ? "1" : "0"},
+  }};
+  for (const auto& [key, value] : rows) {
+    Statement(db, "INSERT INTO settings (key, value) VALUES (?, ?)")
+        .bind(1, key)
+        .bind(2, value)
+        .step();
+  }
+}
+
+// Settings every connection of the stand-in runs with.
+void configure(sqlite3* db) {
+  sqlite3_busy_timeout(db, kBusyTimeoutMilliseconds);
+  execute(db, "PRAGMA foreign_keys = ON; PRAGMA synchronous = FULL;");
+}
+
+// Removes a half-made company file and any journal SQLite left beside it, which a later
+// file of the same name would otherwise take for its own.
+void removeCompanyFile(const std::filesystem::path& path) noexcept {
+  std::error_code ignored;
+  std::filesystem::remove(path, ignored);
+  for (const char* suffix : {"-journal", "-wal", "-shm"}) {
+    const std::filesystem::path side = path.string() + suffix;
+    if (std::filesystem::is_regular_file(std::filesystem::symlink_status(side, ignored))) {
+      std::filesystem::remove(side, ignored);
+    }
+  }
+}
+
+// Whether this process may create files in the folder holding `path` (SQLite's journal).
+bool folderWritable(const std::filesystem::path& path) {
+  std::filesystem::path folder = path.parent_path();
+  if (folder.empty()) folder = ".";
+  return ::faccessat(AT_FDCWD, folder.c_str(), W_OK | X_OK, AT_EACCESS) == 0;
+}
+
+// The lists and transactions the summary counts, by the tables the request handlers keep
+// them in. A file without one of the tables (made before the kind existed) leaves it out.
+struct CountedKind {
+  std::string_view label;
+  std::string_view table;
+};
+constexpr std::array<CountedKind, 6> kCountedKinds{{
+    {"Customers and jobs", "customers"},
+    {"Accounts", "accounts"},
+    {"Items", "items"},
+    {"Sales tax codes", "sales_tax_codes"},
+    {"Estimates", "estimates"},
+    {"Invoices", "invoices"},
+}};
+
+bool hasTable(sqlite3* db, std::string_view table) {
+  Statement found(db, "SELECT 1 FROM sqlite_schema WHERE type = 'table' AND name = ?");
+  found.bind(1, table);
+  return found.step();
+}
+
+}  // namespace
+
+void CompanyFile::create(const std::filesystem::path& path, const CompanySettings& settings) {
+  // Claiming the name with O_EXCL refuses an existing file even when another process
+  // creates the same one at the same moment.
+  const int descriptor = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+  if (descriptor < 0) {
+    const int error = errno;
+    const std::string reason = std::generic_category().message(error);
+    if (error == EEXIST) fail(Kind::AlreadyExists, path, "the file exists already");
+    if (error == ENOENT || error == ENOTDIR) fail(Kind::Missing, path, reason);
+    if (error == EACCES || error == EPERM || error == EROFS) fail(Kind::ReadOnly, path, reason);
+    fail(Kind::Unreadable, path, reason);
+  }
+  ::close(descriptor);
+
+  try {
+    sqlite3* raw = nullptr;
+    const int opened = sqlite3_open_v2(path.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
+    const Database db(raw);
+    if (opened != SQLITE_OK) failSqlite(db.get(), opened, "open");
+    configure(db.get());
+    execute(db.get(), "PRAGMA journal_mode = DELETE");
+    execute(db.get(), "BEGIN IMMEDIATE");
+    writeOwnTables(db.get(), settings);
+    initializeCompanyData(db.get(), settings);
+    execute(db.get(), "COMMIT");
+  } catch (...) {
+    removeCompanyFile(path);
+    throw;
+  }
+}
+
+CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
+  std::error_code error;
+  const auto status = std::filesystem::status(path, error);
+  if (status.type() == std::filesystem::file_type::not_found) {
+    fail(Kind::Missing, path, "no such file");
+  }
+  if (error) fail(Kind::Unreadable, path, error.message());
+  if (!std::filesystem::is_regular_file(status)) fail(Kind::Unreadable, path, "not a file");
+
+  sqlite3* raw = nullptr;
+  const int opened = sqlite3_open_v2(path.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
+  Database db(raw);
+  if (opened != SQLITE_OK) {
+    if ((opened & 0xff) == SQLITE_CANTOPEN) fail(Kind::Unreadable, path, sqlite3_errmsg(raw));
+    failSqlite(db.get(), opened, "open");
+  }
+  sqlite3_busy_timeout(db.get(), kBusyTimeoutMilliseconds);
+
+  {
+    // The first read of the header: a file that is not SQLite fails here.
+    Statement marker(db.get(), "PRAGMA application_id");
+    if (!marker.step() || marker.integer(0) != kApplicationId) {
+      fail(Kind::NotACompanyFile, path, "not a company file");
+    }
+  }
+  try {
+    Statement format(db.get(), "SELECT value FROM settings WHERE key = ?");
+    format.bind(1, kFormatKey);
+    if (!format.step() || format.text(0) != formatMarker()) {
+      fail(Kind::NotACompanyFile, path, "not a company file of this format");
+    }
+  } catch (const CompanyFileError&) {
+    throw;
+  } catch (const std::runtime_error&) {  // the settings table is not there
+    fail(Kind::NotACompanyFile, path, "not a company file");
+  }
+  {
+    Statement integrity(db.get(), "PRAGMA integrity_check(10)");
+    std::string findings;
+    while (integrity.step()) {
+      const std::string line = integrity.text(0);
+      if (line != "ok") findings += (findings.empty() ? "" : "; ") + line;
+    }
+    if (!findings.empty()) fail(Kind::Damaged, path, findings);
+  }
+  if (sqlite3_db_readonly(db.get(), "main") != 0) {
+    fail(Kind::ReadOnly, path, "the file cannot be written");
+  }
+  if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
+
+  configure(db.get());
+  db_ = db.release();
+}
+
+CompanyFile::~CompanyFile() { sqlite3_close_v2(db_); }
+
+CompanySettings CompanyFile::settings() const {
+  CompanySettings settings;
+  Statement rows(db_, "SELECT key, value FROM settings");
+  while (rows.step()) {
+    const std::string key = rows.text(0);
+    if (key == kCompanyNameKey) settings.companyName = rows.text(1);
+    if (key == kSalesTaxKey) settings.salesTax = rows.text(1) == "1";
+  }
+  return settings;
+}
+
+void CompanyFile::inTransaction(const std::function<void()>& work) {
+  // Inside a transaction already: a savepoint, so that the inner work alone is undone.
+  const bool nested = sqlite3_get_autocommit(db_) == 0;
+  execute(db_, nested ? "SAVEPOINT inner_work" : "BEGIN IMMEDIATE");
+  try {
+    work();
+    execute(db_, nested ? "RELEASE inner_work" : "COMMIT");
+  } catch (...) {
+    // SQLite may have rolled back on its own (a full disk, an I/O error).
+    if (sqlite3_get_autocommit(db_) == 0) {
+      sqlite3_exec(db_, nested ? "ROLLBACK TO inner_work; RELEASE inner_work" : "ROLLBACK", nullptr,
+                   nullptr, nullptr);
+    }
+    throw;
+  }
+}
+
+int64_t CompanyFile::nextCounter(std::string_view counter) {
+  Statement next(db_,
+                 "INSERT INTO counters (name, value) VALUES (?, 1) "
+                 "ON CONFLICT (name) DO UPDATE SET value = value + 1 RETURNING value");
+  next.bind(1, counter);
+  if (!next.step()) failSqlite(db_, SQLITE_ERROR, "nextCounter");
+  const int64_t value = next.integer(0);
+  next.step();
+  return value;
+}
+
+std::optional<ApplicationAccess> CompanyFile::application(std::string_view appName) const {
+  Statement row(db_, "SELECT allowed, auto_login FROM integrated_applications WHERE name = ?");
+  row.bind(1, appName);
+  if (!row.step()) return std::nullopt;
+  return ApplicationAccess{row.integer(0) != 0, row.integer(1) != 0};
+}
+
+void CompanyFile::setApplication(std::string_view appName, const ApplicationAccess& access) {
+  inTransaction([&] {
+    Statement(db_,
+              "INSERT INTO integrated_applications (name, allowed, auto_login) VALUES (?, ?, ?) "
+              "ON CONFLICT (name) DO UPDATE SET allowed = excluded.allowed, "
+              "auto_login = excluded.auto_login")
+        .bind(1, appName)
+        .bind(2, int64_t{access.allowed})
+        .bind(3, int64_t{access.autoLogin})
+        .step();
+  });
+}
+
+std::string CompanyFile::summary() const {
+  const CompanySettings current = settings();
+  std::string text = "Company: " + current.companyName + "\n";
+  text += std::string("Sales tax: ") + (current.salesTax ? "on" : "off") + "\n";
+  for (const auto& kind : kCountedKinds) {
+    if (!hasTable(db_, kind.table)) continue;
+    Statement count(db_, "SELECT count(*) FROM " + std::string(kind.table));
+    text +=
+        std::string(kind.label) + ": " + std::to_string(count.step() ? count.integer(0) : 0) + "\n";
+  }
+  text += "Integrated applications:";
+  Statement applications(
+      db_, "SELECT name, allowed, auto_login FROM integrated_applications ORDER BY name");
+  bool any = false;
+  while (applications.step()) {
+    any = true;
+    text += "\n  " + applications.text(0) + ": " +
+            (applications.integer(1) == 0   ? "denied"
+             : applications.integer(2) == 0 ? "allowed, no automatic login"
+                                            : "allowed, automatic login");
+  }
+  text += any ? "\n" : " none\n";
+  return text;
+}
+
+}  // namespace droqbxml::simulator

@@ -1,0 +1,48 @@
+// What every request handler works with: the company file, its store, the company's settings,
+// the moment the request is answered and the qbXML version it was written for, plus the
+// company's standing entries (sales tax codes, the default sales tax item, special accounts)
+// looked up once per document.
+#ifndef DROQBXML_SIMULATOR_HANDLERS_CONTEXT_HPP_
+#define DROQBXML_SIMULATOR_HANDLERS_CONTEXT_HPP_
+
+#include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "simulator/CompanyFile.hpp"
+#include "simulator/handlers/Response.hpp"
+#include "simulator/handlers/Store.hpp"
+
+namespace droqbxml::simulator::handlers {
+
+class Context {
+ public:
+  Context(CompanyFile& company, Store& store, QbxmlVersion version);
+
+  CompanyFile& company;
+  Store& store;
+  const CompanySettings settings;
+  const QbxmlVersion version;
+  int64_t now = 0;  // set for each request
+
+  // The sales tax code of that name ("TAX", "NON"), if the company has it.
+  std::optional<int64_t> salesTaxCode(std::string_view name);
+  // Whether a sales tax code marks what it is set on as taxable.
+  bool isTaxable(int64_t salesTaxCode);
+  // The sales tax item a customer without one gets: the first active sales tax item.
+  std::optional<int64_t> defaultSalesTaxItem();
+  // The first account whose SpecialAccountType is `type` ("AccountsReceivable", ...).
+  std::optional<int64_t> specialAccount(std::string_view type);
+  // Drops what was looked up, after a request whose changes were rolled back.
+  void forgetLookups();
+
+ private:
+  std::map<std::string, std::optional<int64_t>> specialAccounts_;
+  std::map<int64_t, bool> taxable_;
+};
+
+}  // namespace droqbxml::simulator::handlers
+
+#endif  // DROQBXML_SIMULATOR_HANDLERS_CONTEXT_HPP_

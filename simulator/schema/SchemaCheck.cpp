@@ -1,0 +1,463 @@
+// Checks a request tree against the qbXML 13.0 tables: children matched against each
+// aggregate's content automaton (order, required children, unknown elements, cardinality,
+// choices), attributes, and the lexical form of every leaf value.
+#include "simulator/internal/SchemaCheck.hpp"
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace droqbxml::simulator::internal {
+namespace {
+
+bool isSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; }
+bool isDigit(char c) { return c >= '0' && c <= '9'; }
+bool isHex(char c) { return isDigit(c) || (c >= 'a' && c <= 'f') || (c >= 'A' && c <= 'F'); }
+
+std::string_view trimmed(std::string_view text) {
+  while (!text.empty() && isSpace(text.front())) text.remove_prefix(1);
+  while (!text.empty() && isSpace(text.back())) text.remove_suffix(1);
+  return text;
+}
+
+std::string_view withoutSign(std::string_view text) {
+  if (!text.empty() && (text.front() == '+' || text.front() == '-')) text.remove_prefix(1);
+  return text;
+}
+
+bool isInteger(std::string_view text) {
+  const std::string_view digits = withoutSign(text);
+  return !digits.empty() && std::all_of(digits.begin(), digits.end(), isDigit);
+}
+
+// Digits with an optional fraction: "12", "12.", "12.345", ".5", each with an optional sign.
+bool isDecimal(std::string_view text) {
+  const std::string_view body = withoutSign(text);
+  const std::size_t point = body.find('.');
+  const std::string_view whole = body.substr(0, point);
+  const std::string_view fraction =
+      point == std::string_view::npos ? std::string_view() : body.substr(point + 1);
+  return (!whole.empty() || !fraction.empty()) &&
+         std::all_of(whole.begin(), whole.end(), isDigit) &&
+         std::all_of(fraction.begin(), fraction.end(), isDigit);
+}
+
+// The value of an INTTYPE text, held within +-10^12 so that long texts cannot overflow.
+long long clampedInteger(std::string_view text) {
+  long long value = 0;
+  for (char c : withoutSign(text)) value = std::min(value * 10 + (c - '0'), 1'000'000'000'000LL);
+  return !text.empty() && text.front() == '-' ? -value : value;
+}
+
+int number(std::string_view digits) {
+  int value = 0;
+  for (char c : digits) value = value * 10 + (c - '0');
+  return value;
+}
+
+bool fixedDigits(std::string_view text, std::size_t at, std::size_t count) {
+  return at + count <= text.size() &&
+         std::all_of(text.begin() + static_cast<std::ptrdiff_t>(at),
+                     text.begin() + static_cast<std::ptrdiff_t>(at + count), isDigit);
+}
+
+// yyyy-mm-dd naming a day of the Gregorian calendar (years 0001 to 9999).
+bool isDate(std::string_view text) {
+  if (text.size() != 10 || !fixedDigits(text, 0, 4) || text[4] != '-' || !fixedDigits(text, 5, 2) ||
+      text[7] != '-' || !fixedDigits(text, 8, 2)) {
+    return false;
+  }
+  const int year = number(text.substr(0, 4));
+  const int month = number(text.substr(5, 2));
+  const int day = number(text.substr(8, 2));
+  if (year < 1 || month < 1 || month > 12 || day < 1) return false;
+  static constexpr std::array<int, 12> kDays{31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+  const bool leap = (year % 4 == 0 && year % 100 != 0) || year % 400 == 0;
+  return day <= kDays[static_cast<std::size_t>(month - 1)] + (month == 2 && leap ? 1 : 0);
+}
+
+// hh:mm or hh:mm:ss at the start of `text`, within a day.
+bool isClock(std::string_view text, bool withSeconds) {
+  const std::size_t size = withSeconds ? 8 : 5;
+  if (text.size() != size || !fixedDigits(text, 0, 2) || text[2] != ':' ||
+      !fixedDigits(text, 3, 2) || number(text.substr(0, 2)) > 23 ||
+      number(text.substr(3, 2)) > 59) {
+    return false;
+  }
+  return !withSeconds ||
+         (text[5] == ':' && fixedDigits(text, 6, 2) && number(text.substr(6)) <= 59);
+}
+
+// A date, optionally "T" and hh:mm:ss, and after the time optionally +hh:mm or -hh:mm.
+bool isDateTime(std::string_view text) {
+  if (!isDate(text.substr(0, 10))) return false;
+  if (text.size() == 10) return true;
+  if (text.size() < 19 || text[10] != 'T' || !isClock(text.substr(11, 8), true)) return false;
+  if (text.size() == 19) return true;
+  return (text[19] == '+' || text[19] == '-') && isClock(text.substr(20), false);
+}
+
+bool isGuid(std::string_view text) {
+  if (text == "0") return true;
+  static constexpr std::string_view kShape = "{xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx}";
+  if (text.size() != kShape.size()) return false;
+  for (std::size_t i = 0; i < kShape.size(); ++i) {
+    if (kShape[i] == 'x' ? !isHex(text[i]) : text[i] != kShape[i]) return false;
+  }
+  return true;
+}
+
+std::size_t characterCount(std::string_view utf8) {
+  return static_cast<std::size_t>(std::count_if(utf8.begin(), utf8.end(), [](char c) {
+    return (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+  }));
+}
+
+std::string joined(const std::vector<std::string_view>& names, std::string_view separator) {
+  std::string text;
+  for (std::size_t i = 0; i < names.size(); ++i) {
+    if (i > 0) text += separator;
+    text += names[i];
+  }
+  return text;
+}
+
+// "'A'", "'A' or 'B'", "'A', 'B' or 'C'".
+std::string alternatives(const std::vector<std::string_view>& names) {
+  std::string text;
+  for (std::size_t i = 0; i < names.size(); ++i) {
+    if (i > 0) text += i + 1 == names.size() ? " or " : ", ";
+    text += "'" + std::string(names[i]) + "'";
+  }
+  return text;
+}
+
+// At most `limit` names, then how many more there are.
+std::string listed(const std::vector<std::string_view>& names, std::size_t limit) {
+  if (names.size() <= limit) return joined(names, ", ");
+  const std::vector<std::string_view> shown(names.begin(),
+                                            names.begin() + static_cast<std::ptrdiff_t>(limit));
+  return joined(shown, ", ") + " and " + std::to_string(names.size() - limit) + " more";
+}
+
+std::vector<std::string_view> valuesOf(std::uint16_t first, std::uint16_t count) {
+  const auto values = enumValues(first, count);
+  return {values.begin(), values.end()};
+}
+
+class TreeChecker {
+ public:
+  explicit TreeChecker(ProblemList& problems) : problems_(problems) {}
+
+  void checkRoot(XmlNode& root) {
+    path_ = root.name;
+    if (root.name != "QBXML") {
+      report(root.line, "expected root element QBXML; found: " + root.name);
+      return;
+    }
+    checkAggregate(root, findAggregate("QBXML"));
+  }
+
+ private:
+  // Appends "/name" to the element path for the life of the object.
+  class Step {
+   public:
+    Step(std::string& path, std::string_view name) : path_(path), size_(path.size()) {
+      path_ += '/';
+      path_ += name;
+    }
+    ~Step() { path_.resize(size_); }
+    Step(const Step&) = delete;
+    Step& operator=(const Step&) = delete;
+
+   private:
+    std::string& path_;
+    std::size_t size_;
+  };
+
+  void report(int line, std::string message) { problems_.add(line, path_, std::move(message)); }
+
+  void checkElement(XmlNode& node, const Particle& particle) {
+    if (particle.content == ContentKind::kValue) {
+      checkLeaf(node, particle);
+    } else if (particle.content == ContentKind::kAggregate) {
+      checkAggregate(node, particle.aggregate);
+    }
+  }
+
+  void checkLeaf(XmlNode& node, const Particle& leaf) {
+    for (const auto& [name, value] : node.attributes) {
+      report(node.line, "unknown attribute '" + name + "' on " + node.name);
+    }
+    for (const XmlNode& child : node.children) {
+      const Step step(path_, child.name);
+      report(child.line, "unexpected element '" + child.name + "' in " + node.name +
+                             ", which holds a value, not other elements");
+    }
+    if (auto problem = leafProblem(leaf, node.text)) {
+      report(node.line, std::move(*problem));
+    } else if (node.text.empty() && node.children.empty()) {
+      node.text = leaf.defaultValue;
+    }
+  }
+
+  void checkAggregate(XmlNode& node, int index) {
+    const AggregateRule& rule = aggregates()[static_cast<std::size_t>(index)];
+    checkAttributes(node, rule);
+    const std::string_view text = trimmed(node.text);
+    if (!text.empty()) {
+      report(node.line, "unexpected text " + quoted(text) + " in " + node.name);
+    }
+    checkChildren(node, automatonOf(index));
+  }
+
+  void checkAttributes(const XmlNode& node, const AggregateRule& rule) {
+    const auto rules = attributesOf(rule);
+    for (const auto& [name, value] : node.attributes) {
+      const auto found = std::find_if(rules.begin(), rules.end(),
+                                      [&](const AttributeRule& r) { return r.name == name; });
+      if (found == rules.end()) {
+        report(node.line, "unknown attribute '" + name + "' on " + node.name);
+        continue;
+      }
+      const auto values = valuesOf(found->firstEnum, found->enumCount);
+      if (!values.empty() && std::find(values.begin(), values.end(), value) == values.end()) {
+        report(node.line, quoted(value) + " is not a value of attribute '" + name + "' (" +
+                              joined(values, ", ") + ")");
+      }
+    }
+    for (const AttributeRule& r : rules) {
+      if (r.required && !node.attribute(r.name)) {
+        report(node.line,
+               "missing required attribute '" + std::string(r.name) + "' on " + node.name);
+      }
+    }
+  }
+
+  static std::vector<int> next(const ContentAutomaton& automaton, const std::vector<int>& state) {
+    if (state.empty()) return automaton.first;
+    std::vector<int> candidates;
+    for (int position : state) {
+      for (int following : automaton.follow[static_cast<std::size_t>(position)]) {
+        if (std::find(candidates.begin(), candidates.end(), following) == candidates.end()) {
+          candidates.push_back(following);
+        }
+      }
+    }
+    std::sort(candidates.begin(), candidates.end());
+    return candidates;
+  }
+
+  static std::vector<int> named(const ContentAutomaton& automaton,
+                                const std::vector<int>& positions, std::string_view name) {
+    std::vector<int> result;
+    for (int position : positions) {
+      if (automaton.nameAt(position) == name) result.push_back(position);
+    }
+    return result;
+  }
+
+  void checkChildren(XmlNode& node, const ContentAutomaton& automaton) {
+    std::vector<int> state;  // empty: before the first child
+    int run = 0;             // how many times in a row the current position matched
+    for (XmlNode& child : node.children) {
+      if (problems_.full()) return;
+      const Step step(path_, child.name);
+      const std::vector<int> candidates = next(automaton, state);
+      std::vector<int> matched = named(automaton, candidates, child.name);
+      if (!matched.empty()) {
+        run = (!state.empty() && matched == state) ? run + 1 : 1;
+        const Particle& particle = automaton.particleAt(matched.front());
+        if (particle.maxOccurs > 1 && particle.maxOccurs != kUnbounded &&
+            run > particle.maxOccurs) {
+          report(child.line, tooMany(child.name, node.name, particle.maxOccurs));
+        }
+        state = std::move(matched);
+        checkElement(child, particle);
+        continue;
+      }
+      std::vector<int> all(automaton.positions.size());
+      for (std::size_t i = 0; i < all.size(); ++i) all[i] = static_cast<int>(i);
+      std::vector<int> elsewhere = named(automaton, all, child.name);
+      if (elsewhere.empty()) {
+        report(child.line, unknown(child.name, node.name));
+        continue;
+      }
+      if (!named(automaton, state, child.name).empty()) {
+        report(child.line,
+               tooMany(child.name, node.name, automaton.particleAt(state.front()).maxOccurs));
+      } else {
+        report(child.line,
+               misplaced(automaton, candidates, state, elsewhere, child.name, node.name));
+      }
+      state = std::move(elsewhere);
+      run = 1;
+      checkElement(child, automaton.particleAt(state.front()));
+    }
+    if (problems_.full()) return;
+    const bool complete = state.empty()
+                              ? automaton.acceptsEmpty
+                              : std::any_of(state.begin(), state.end(), [&](int position) {
+                                  return automaton.accepting[static_cast<std::size_t>(position)];
+                                });
+    if (!complete) {
+      const auto& missing = state.empty()
+                                ? automaton.missingAtStart
+                                : automaton.missingAfter[static_cast<std::size_t>(state.front())];
+      report(node.line, "missing required element " + alternatives(missing) + " in " + node.name);
+    }
+  }
+
+  static std::string tooMany(const std::string& name, const std::string& parent, int most) {
+    return "too many '" + name + "' elements in " + parent + " (at most " + std::to_string(most) +
+           ")";
+  }
+
+  static std::string unknown(const std::string& name, const std::string& parent) {
+    if (parent == "QBXMLMsgsRq" && name.size() > 2 && name.ends_with("Rq")) {
+      return "unsupported request '" + name + "'";
+    }
+    return "unknown element '" + name + "' in " + parent;
+  }
+
+  static std::string misplaced(const ContentAutomaton& automaton,
+                               const std::vector<int>& candidates, const std::vector<int>& state,
+                               const std::vector<int>& elsewhere, const std::string& name,
+                               const std::string& parent) {
+    std::vector<std::string_view> expected;
+    for (int position : candidates) {
+      const std::string_view candidate = automaton.nameAt(position);
+      if (std::find(expected.begin(), expected.end(), candidate) == expected.end()) {
+        expected.push_back(candidate);
+      }
+    }
+    std::string message = expected.empty() ? "expected the end of " + parent
+                                           : "expected one of: " + listed(expected, 12);
+    message += "; found: " + name;
+    if (!state.empty() && leadsTo(automaton, elsewhere, state)) {
+      message += ", which belongs before " + std::string(automaton.nameAt(state.front()));
+    }
+    return message;
+  }
+
+  // Whether content may go on from one of `from` to one of `to` (so that an element found
+  // too late would have fitted before the earlier one).
+  static bool leadsTo(const ContentAutomaton& automaton, const std::vector<int>& from,
+                      const std::vector<int>& to) {
+    std::vector<bool> seen(automaton.positions.size(), false);
+    std::vector<int> pending = from;
+    while (!pending.empty()) {
+      const int position = pending.back();
+      pending.pop_back();
+      for (int following : automaton.follow[static_cast<std::size_t>(position)]) {
+        if (std::find(to.begin(), to.end(), following) != to.end()) return true;
+        if (!seen[static_cast<std::size_t>(following)]) {
+          seen[static_cast<std::size_t>(following)] = true;
+          pending.push_back(following);
+        }
+      }
+    }
+    return false;
+  }
+
+  ProblemList& problems_;
+  std::string path_;
+};
+
+}  // namespace
+
+void ProblemList::add(int line, std::string element, std::string message) {
+  if (full_) return;
+  if (problems_.size() == kLimit) {
+    problems_.push_back(
+        {line, std::move(element),
+         "more problems follow; only the first " + std::to_string(kLimit) + " are listed"});
+    full_ = true;
+    return;
+  }
+  problems_.push_back({line, std::move(element), std::move(message)});
+}
+
+std::string quoted(std::string_view text) {
+  constexpr std::size_t kShown = 60;
+  if (text.size() <= kShown) return "'" + std::string(text) + "'";
+  std::size_t cut = kShown;
+  while (cut > 0 && (static_cast<unsigned char>(text[cut]) & 0xC0) == 0x80) --cut;
+  return "'" + std::string(text.substr(0, cut)) + "...'";
+}
+
+std::optional<std::string> valueProblem(ValueType type, std::string_view text) {
+  const std::string_view collapsed = trimmed(text);
+  switch (type) {
+    case ValueType::kStr:
+    case ValueType::kEnum:
+      return std::nullopt;
+    case ValueType::kId:
+      if (characterCount(text) <= 36) return std::nullopt;
+      return quoted(text) + " is longer than the 36 characters of an IDTYPE value";
+    case ValueType::kBool:
+      if (collapsed.empty() || collapsed == "true" || collapsed == "false" || collapsed == "1" ||
+          collapsed == "0") {
+        return std::nullopt;
+      }
+      return quoted(text) + " is not a BOOLTYPE value (true, false, 1, 0)";
+    case ValueType::kDate:
+      if (collapsed.empty() || isDate(collapsed)) return std::nullopt;
+      return quoted(text) + " is not a DATETYPE value (a valid date yyyy-mm-dd)";
+    case ValueType::kDateTime:
+      if (collapsed.empty() || isDateTime(text)) return std::nullopt;
+      return quoted(text) +
+             " is not a DATETIMETYPE value (a valid date yyyy-mm-dd, optionally followed by "
+             "Thh:mm:ss and then by +hh:mm or -hh:mm)";
+    case ValueType::kInt:
+      if (isInteger(collapsed)) return std::nullopt;
+      return quoted(text) + " is not an INTTYPE value (a whole number)";
+    case ValueType::kFloat:
+      if (collapsed.empty() || isDecimal(collapsed)) return std::nullopt;
+      return quoted(text) + " is not a FLOATTYPE value (a decimal number)";
+    case ValueType::kGuid:
+      if (isGuid(text)) return std::nullopt;
+      return quoted(text) +
+             " is not a GUIDTYPE value ({XXXXXXXX-XXXX-XXXX-XXXX-XXXXXXXXXXXX} or 0)";
+    case ValueType::kAmt:
+    case ValueType::kPrice:
+    case ValueType::kQuan:
+    case ValueType::kPercent: {
+      // Decimals are not counted here: QuickBooks takes "246.9" as a request and answers
+      // it with a conversion error, so only text that is no number at all is refused.
+      if (text.empty() || isDecimal(text)) return std::nullopt;
+      constexpr std::string_view kNames[] = {"an AMTTYPE", "a PRICETYPE", "a QUANTYPE",
+                                             "a PERCENTTYPE"};
+      const auto which =
+          static_cast<std::size_t>(static_cast<int>(type) - static_cast<int>(ValueType::kAmt));
+      return quoted(text) + " is not " + std::string(kNames[which]) + " value (a number)";
+    }
+  }
+  return std::nullopt;
+}
+
+std::optional<std::string> leafProblem(const Particle& leaf, std::string_view text) {
+  if (text.empty() && !leaf.defaultValue.empty()) text = leaf.defaultValue;
+  if (leaf.type == ValueType::kEnum) {
+    const auto values = valuesOf(leaf.firstEnum, leaf.enumCount);
+    if (std::find(values.begin(), values.end(), text) != values.end()) return std::nullopt;
+    return quoted(text) + " is not one of: " + listed(values, 16);
+  }
+  if (auto problem = valueProblem(leaf.type, text)) return problem;
+  if (leaf.hasMinimum && clampedInteger(trimmed(text)) < leaf.minimum) {
+    return quoted(text) + " is less than " + std::to_string(leaf.minimum) + ", the least " +
+           std::string(leaf.name) + " may be";
+  }
+  return std::nullopt;
+}
+
+void checkRequestTree(XmlNode& root, ProblemList& problems) {
+  TreeChecker(problems).checkRoot(root);
+}
+
+}  // namespace droqbxml::simulator::internal
