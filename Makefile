@@ -19,8 +19,8 @@ bench: setup
 
 demo: setup
 	cmake --preset release
-	cmake --build --preset release
-	./build/release/bench/droqbxml_bench --benchmark_filter=Escape/1
+	cmake --build --preset release --target droqbxml_command
+	./build/release/cli/droqbxml demo
 
 format:
 	clang-format -i $$(git ls-files '*.cpp' '*.hpp')

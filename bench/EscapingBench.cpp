@@ -29,7 +29,8 @@ void BM_Escape(benchmark::State& state) {
 }
 
 void BM_Unescape(benchmark::State& state) {
-  const Text escaped = XMLEscapeString(mixedText(static_cast<size_t>(state.range(0)) * 1000000 / 2));
+  const Text escaped =
+      XMLEscapeString(mixedText(static_cast<size_t>(state.range(0)) * 1000000 / 2));
   for (auto _ : state) benchmark::DoNotOptimize(XMLUnEscapeText(escaped, false));
   state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) *
                           static_cast<int64_t>(escaped.size() * 2));

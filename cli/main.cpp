@@ -3,4 +3,6 @@
 
 #include "cli/Cli.hpp"
 
-int main(int argc, char** argv) { return droqbxml::cli::run(argc, argv, std::cin, std::cout, std::cerr); }
+int main(int argc, char** argv) {
+  return droqbxml::cli::run(argc, argv, std::cin, std::cout, std::cerr);
+}

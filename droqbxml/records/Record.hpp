@@ -193,10 +193,10 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  const Text name(record_.fieldSpecs()[index].name);
-  record_.setFieldValue(index,
-                        basCommonProcs::getElementValue(value_, name, start_, end_, isRequired,
-                                                        isRequired ? parent_ : Text()));
+  record_.setFieldValue(
+      index, basCommonProcs::getElementValue(value_, record_.fieldSpecs()[index].name, start_,
+                                             end_, isRequired,
+                                             isRequired ? TextView(parent_) : TextView()));
 }
 
 }  // namespace droqbxml

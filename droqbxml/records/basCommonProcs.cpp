@@ -17,11 +17,19 @@ constexpr size_t kSelfClosingWindow = 100;
                           u"'.\r\nThis element is not allowed to be empty.");
 }
 
-// A self-closing form wholly inside the window at the cursor: its 0-based position.
-size_t selfClosingAt(const Text& value, size_t cursor, const Text& tag) {
+// The first "<N/>", else the first "<N />", lying wholly inside the window at the cursor:
+// its 0-based position.
+size_t selfClosingAt(const Text& value, size_t cursor, TextView name) {
   const TextView window = TextView(value).substr(cursor, kSelfClosingWindow);
-  const size_t at = window.find(tag);
-  return at == TextView::npos ? Text::npos : cursor + at;
+  size_t spaced = Text::npos;
+  for (size_t at = window.find(u'<'); at != TextView::npos; at = window.find(u'<', at + 1)) {
+    const TextView rest = window.substr(at + 1);
+    if (!rest.starts_with(name)) continue;
+    const TextView after = rest.substr(name.size());
+    if (after.starts_with(u"/>")) return cursor + at;
+    if (spaced == Text::npos && after.starts_with(u" />")) spaced = cursor + at;
+  }
+  return spaced;
 }
 
 }  // namespace
@@ -35,25 +43,33 @@ int32_t findInResponse(int32_t start, const Text& text, TextView what) {
 
 Text getElementValue(const Text& Value, const Text& ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, const Text& Parent) {
+  return getElementValue(Value, TextView(ElementName), StartPoint, EndPoint, Required, Parent);
+}
+
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent) {
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
   if (from <= Value.size()) {
-    for (const Text& tag : {u"<" + ElementName + u"/>", u"<" + ElementName + u" />"}) {
-      const size_t at = selfClosingAt(Value, from, tag);
-      if (at != Text::npos) {
-        // Empty by its form: the required test is not made.
-        StartPoint = static_cast<int32_t>(at + 1);
-        EndPoint = findInResponse(StartPoint, Value, u"/>");
-        return {};
-      }
+    const size_t at = selfClosingAt(Value, from, ElementName);
+    if (at != Text::npos) {
+      // Empty by its form: the required test is not made.
+      StartPoint = static_cast<int32_t>(at + 1);
+      EndPoint = findInResponse(StartPoint, Value, u"/>");
+      return {};
     }
   }
   Text result;
-  const int32_t start = findInResponse(cursor, Value, u"<" + ElementName + u">");
+  // "</N>" built once in a buffer of the thread; "<N>" is the same text without the slash.
+  thread_local Text startTag;
+  thread_local Text endTag;
+  startTag.assign(u"<").append(ElementName).push_back(u'>');
+  endTag.assign(u"</").append(ElementName).push_back(u'>');
+  const int32_t start = findInResponse(cursor, Value, startTag);
   if (start > 0) {
     StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;
-    EndPoint = findInResponse(StartPoint, Value, u"</" + ElementName + u">");
+    EndPoint = findInResponse(StartPoint, Value, endTag);
     if (EndPoint > 0) {
       result = Value.substr(static_cast<size_t>(StartPoint - 1),
                             static_cast<size_t>(EndPoint - StartPoint));
@@ -62,7 +78,7 @@ Text getElementValue(const Text& Value, const Text& ElementName, int32_t& StartP
     StartPoint = cursor;
   }
   if (result.empty() && Required) {
-    raiseEmptyElementError(Parent + u"<" + ElementName + u">",
+    raiseEmptyElementError(Text(Parent) + u"<" + Text(ElementName) + u">",
                            u"DroQbXml.basCommonProcs.getElementValue");
   }
   return result;

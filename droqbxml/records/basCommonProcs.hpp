@@ -22,6 +22,10 @@ namespace droqbxml::basCommonProcs {
 Text getElementValue(const Text& Value, const Text& ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, const Text& Parent);
 
+// The same for names and parents held as views (the records' own tables).
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent);
+
 // The first 1-based position of `what` at or after `start` in `text`, 0 when absent: the
 // platform's InStr over response text, answered from the tag index when `what` is a tag.
 int32_t findInResponse(int32_t start, const Text& text, TextView what);

@@ -27,7 +27,11 @@ class CliTest : public ::testing::Test {
     registerRequestProcessor(kFakeProgId, [f = fake_] { return f; });
     unregisterRequestProcessor(kRequestProcessorProgId);
   }
-  void TearDown() override { unregisterRequestProcessor(kFakeProgId); }
+  void TearDown() override {
+    unregisterRequestProcessor(kFakeProgId);
+    // The command installs the embedded stand-in where nothing answers for QuickBooks.
+    unregisterRequestProcessor(kRequestProcessorProgId);
+  }
 
   Result run(std::vector<std::string> args, const std::string& input = "") {
     args.insert(args.begin(), "droqbxml");
@@ -135,10 +139,16 @@ TEST_F(CliTest, QueriesThroughTheBuilderWithTheHostsIdentity) {
 }
 
 TEST_F(CliTest, ConnectionAndSessionFailuresExitWith3) {
-  const Result noProcessor = run({"send", "-", "--company", "C:\\co.qbw"}, "<r/>");
+  // Without a processor of the platform the embedded stand-in answers, and it has no such
+  // company file.
+  const Result standIn = run({"send", "-", "--company", "C:\\none\\co.qbw"}, "<r/>");
+  EXPECT_EQ(standIn.code, cli::kExitConnection);
+  EXPECT_NE(standIn.err.find("Could not open the specified QuickBooks company data file."),
+            std::string::npos);
+  const Result noProcessor = run({"--processor", "No.Such", "send", "-"}, "<r/>");
   EXPECT_EQ(noProcessor.code, cli::kExitConnection);
-  EXPECT_NE(noProcessor.err.find("no request processor is available"), std::string::npos);
-  EXPECT_EQ(run({"--processor", "No.Such", "send", "-"}, "<r/>").code, cli::kExitConnection);
+  EXPECT_NE(noProcessor.err.find("no request processor is available under \"No.Such\""),
+            std::string::npos);
 
   const Result noCompany = run({"--processor", "Test.FakeProcessor", "send", "-"}, "<r/>");
   EXPECT_EQ(noCompany.code, cli::kExitConnection);

@@ -1,5 +1,6 @@
 // The tag index behind findForward: one pass over the text records the position of every
-// "<...>" token (a "<" up to the next ">" with no "<" between) by its exact text. A whole-tag
+// "<...>" token without blanks (a "<" up to the next ">" with no "<" or blank between) by
+// its exact text. A whole-tag
 // pattern occurs exactly where such a token equals it, so a binary search among that
 // token's positions gives the first occurrence at or after any cursor.
 #include "droqbxml/records/internal/TextSearch.hpp"
@@ -19,9 +20,14 @@ namespace {
 constexpr size_t kIndexThreshold = 32 * 1024;
 constexpr size_t kCachedTexts = 4;
 
+// Tags are short: FNV-1a over their code units is cheaper than the general string hash.
 struct ViewHash {
   using is_transparent = void;
-  size_t operator()(TextView view) const noexcept { return std::hash<TextView>{}(view); }
+  size_t operator()(TextView view) const noexcept {
+    uint64_t hash = 1469598103934665603ull;
+    for (const char16_t c : view) hash = (hash ^ c) * 1099511628211ull;
+    return static_cast<size_t>(hash);
+  }
 };
 
 struct TagIndex {
@@ -33,13 +39,16 @@ struct TagIndex {
   std::unordered_map<Text, std::vector<uint32_t>, ViewHash, std::equal_to<>> positions;
 };
 
-// A sample of the text: enough to notice a different text placed at the same address.
+// The text's size and its first and last code units: enough to notice another text placed
+// at the same address, and cheap enough to check at every search. A text changed in place
+// between the ends keeps its fingerprint; a search whose indexed answer no longer holds
+// falls back to a plain search (see findForward).
 uint64_t fingerprintOf(const Text& text) {
   uint64_t hash = 1469598103934665603ull ^ text.size();
-  const size_t step = std::max<size_t>(1, text.size() / 256);
-  for (size_t i = 0; i < text.size(); i += step) hash = (hash ^ text[i]) * 1099511628211ull;
-  const size_t tail = text.size() > 64 ? text.size() - 64 : 0;
-  for (size_t i = tail; i < text.size(); ++i) hash = (hash ^ text[i]) * 1099511628211ull;
+  const size_t ends = std::min<size_t>(8, text.size());
+  for (size_t i = 0; i < ends; ++i) hash = (hash ^ text[i]) * 1099511628211ull;
+  for (size_t i = text.size() - ends; i < text.size(); ++i)
+    hash = (hash ^ text[i]) * 1099511628211ull;
   return hash;
 }
 
@@ -48,9 +57,12 @@ void build(TagIndex& index, const Text& text) {
   const TextView view(text);
   size_t at = view.find(u'<');
   while (at != TextView::npos) {
-    const size_t close = view.find_first_of(u"<>", at + 1);
+    const size_t close = view.find_first_of(u"<> ", at + 1);
     if (close == TextView::npos) break;
-    if (view[close] == u'>') {
+    if (view[close] == u' ') {
+      // A tag with attributes: no element-name pattern can be it.
+      at = view.find(u'<', close + 1);
+    } else if (view[close] == u'>') {
       const TextView token = view.substr(at, close - at + 1);
       auto found = index.positions.find(token);
       if (found == index.positions.end()) found = index.positions.emplace(Text(token), 0).first;
@@ -87,9 +99,10 @@ struct IndexCache {
   }
 };
 
+// "<Name>" or "</Name>": no blank, no other angle bracket.
 bool isWholeTag(TextView pattern) {
   return pattern.size() >= 2 && pattern.front() == u'<' && pattern.back() == u'>' &&
-         pattern.substr(1, pattern.size() - 2).find_first_of(u"<>") == TextView::npos;
+         pattern.substr(1, pattern.size() - 2).find_first_of(u"<> ") == TextView::npos;
 }
 
 }  // namespace

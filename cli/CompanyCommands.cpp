@@ -1,0 +1,82 @@
+// company create/show/allow/deny and lint: the commands that work on the stand-in's company
+// files and on request documents without talking to a processor.
+#include <iostream>
+
+#include "cli/Cli.hpp"
+#include "cli/Commands.hpp"
+#include "simulator/CompanyFile.hpp"
+#include "simulator/RequestDocument.hpp"
+
+namespace droqbxml::cli {
+namespace {
+
+using simulator::CompanyFile;
+using simulator::CompanyFileError;
+
+template <class F>
+int withCompanyFile(Io io, const std::string& path, F work) {
+  try {
+    CompanyFile company(path);
+    return work(company);
+  } catch (const CompanyFileError& error) {
+    io.err << "droqbxml: " << error.what() << '\n';
+    return kExitConnection;
+  }
+}
+
+}  // namespace
+
+int companyCreateCommand(Io io, const CompanyOptions& options) {
+  try {
+    CompanyFile::create(options.path, {options.name, options.salesTax});
+  } catch (const CompanyFileError& error) {
+    io.err << "droqbxml: " << error.what() << '\n';
+    return error.kind() == CompanyFileError::Kind::AlreadyExists ? kExitUsage : kExitConnection;
+  }
+  io.out << "Created company file " << options.path << " (\"" << options.name << "\", sales tax "
+         << (options.salesTax ? "on" : "off") << ")\n";
+  return kExitSuccess;
+}
+
+int companyShowCommand(Io io, const CompanyOptions& options) {
+  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+    io.out << company.summary();
+    return kExitSuccess;
+  });
+}
+
+int companyAllowCommand(Io io, const CompanyOptions& options) {
+  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+    company.setApplication(options.appName, {true, options.autoLogin});
+    io.out << "\"" << options.appName << "\" may use " << options.path
+           << (options.autoLogin ? " and log in automatically" : " when a user is logged in")
+           << '\n';
+    return kExitSuccess;
+  });
+}
+
+int companyDenyCommand(Io io, const CompanyOptions& options) {
+  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+    company.setApplication(options.appName, {false, false});
+    io.out << "\"" << options.appName << "\" may not use " << options.path << '\n';
+    return kExitSuccess;
+  });
+}
+
+int lintCommand(Io io, const std::string& file) {
+  const auto bytes = readDocument(io, file);
+  if (!bytes) return kExitUsage;
+  const auto result = simulator::readRequest(*bytes);
+  const std::string name = file == "-" ? "<stdin>" : file;
+  for (const auto& problem : result.problems) {
+    io.out << name << ':' << problem.line << ": " << problem.element << ": " << problem.message
+           << '\n';
+  }
+  if (result.problems.empty()) {
+    io.out << name << ": valid qbXML " << result.document->qbxmlVersion << " request\n";
+    return kExitSuccess;
+  }
+  return kExitNotSuccess;
+}
+
+}  // namespace droqbxml::cli
