@@ -16,8 +16,18 @@ constexpr std::array<const char*, 7> kDays{"Sun", "Mon", "Tue", "Wed", "Thu", "F
 constexpr std::array<const char*, 12> kMonths{"Jan", "Feb", "Mar", "Apr", "May", "Jun",
                                               "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
 
-// Days since 1970-01-01 of a proleptic Gregorian date.
-constexpr int64_t daysFromCivil(int64_t y, int64_t m, int64_t d) {
+const int64_t kOleEpochDays = -25569;  // 1899-12-30
+
+int32_t hour12(int32_t hour) {
+  const int32_t h = hour % 12;
+  return h == 0 ? 12 : h;
+}
+
+Text ascii(const std::string& s) { return asciiText(s); }
+
+}  // namespace
+
+int64_t daysFromCivil(int64_t y, int32_t m, int32_t d) {
   y -= m <= 2;
   const int64_t era = (y >= 0 ? y : y - 399) / 400;
   const int64_t yoe = y - era * 400;
@@ -37,17 +47,6 @@ void civilFromDays(int64_t z, int32_t& year, int32_t& month, int32_t& day) {
   month = static_cast<int32_t>(mp < 10 ? mp + 3 : mp - 9);
   year = static_cast<int32_t>(yoe + era * 400 + (month <= 2));
 }
-
-constexpr int64_t kOleEpochDays = daysFromCivil(1899, 12, 30);
-
-int32_t hour12(int32_t hour) {
-  const int32_t h = hour % 12;
-  return h == 0 ? 12 : h;
-}
-
-Text ascii(const std::string& s) { return asciiText(s); }
-
-}  // namespace
 
 LocalTime now() {
   if (fixedClock) return *fixedClock;
@@ -93,8 +92,8 @@ Text formatShortDateTime(const LocalTime& time) {
   std::snprintf(buffer.data(), buffer.size(), "%d/%d/%d", time.month, time.day, time.year);
   std::string out = buffer.data();
   if (time.hour != 0 || time.minute != 0 || time.second != 0) {
-    std::snprintf(buffer.data(), buffer.size(), " %d:%02d:%02d %s", hour12(time.hour),
-                  time.minute, time.second, time.hour < 12 ? "AM" : "PM");
+    std::snprintf(buffer.data(), buffer.size(), " %d:%02d:%02d %s", hour12(time.hour), time.minute,
+                  time.second, time.hour < 12 ? "AM" : "PM");
     out += buffer.data();
   }
   return ascii(out);

@@ -51,6 +51,10 @@ Text formatIsoDateTime(const LocalTime& time);
 // midnight.
 Text formatShortDateTime(const LocalTime& time);
 
+// Days since 1970-01-01 of a date of the proleptic Gregorian calendar, and back.
+int64_t daysFromCivil(int64_t year, int32_t month, int32_t day);
+void civilFromDays(int64_t days, int32_t& year, int32_t& month, int32_t& day);
+
 // Dates as the platform keeps them: days since 1899-12-30, the time as the fraction.
 LocalTime fromOleDate(double oleDate);
 double toOleDate(const LocalTime& time);

@@ -9,15 +9,12 @@
 #include "droqbxml/connection/RequestProcessor.hpp"
 #include "simulator/Simulator.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/cli/CliRunner.hpp"
 
 namespace droqbxml {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
+using Result = test::CliResult;
 
 class CliStandInTest : public ::testing::Test {
  protected:
@@ -32,15 +29,8 @@ class CliStandInTest : public ::testing::Test {
     unregisterRequestProcessor(simulator::kSimulatorProgId);
   }
 
-  Result run(std::vector<std::string> args, const std::string& input = "") {
-    args.insert(args.begin(), "droqbxml");
-    std::vector<const char*> argv;
-    for (const auto& a : args) argv.push_back(a.c_str());
-    std::istringstream in(input);
-    std::ostringstream out;
-    std::ostringstream err;
-    const int code = cli::run(static_cast<int>(argv.size()), argv.data(), in, out, err);
-    return {code, out.str(), err.str()};
+  Result run(const std::vector<std::string>& args, const std::string& input = "") {
+    return test::runCli(args, input);
   }
 
   test::TemporaryDrive drive_;
@@ -49,8 +39,8 @@ class CliStandInTest : public ::testing::Test {
 };
 
 TEST_F(CliStandInTest, CreatesShowsAndManagesCompanyFiles) {
-  const Result created = run({"company", "create", company_, "--name", "Acme Builders",
-                              "--sales-tax", "off"});
+  const Result created =
+      run({"company", "create", company_, "--name", "Acme Builders", "--sales-tax", "off"});
   EXPECT_EQ(created.code, cli::kExitSuccess) << created.err;
   EXPECT_EQ(run({"company", "create", company_}).code, cli::kExitUsage);  // exists already
   const Result shown = run({"company", "show", company_});
@@ -81,7 +71,8 @@ TEST_F(CliStandInTest, QueriesAndSendsThroughTheStandIn) {
 }
 
 TEST_F(CliStandInTest, LintNamesEachProblem) {
-  const Result built = run({"build", "query", "customer", "--active", "all", "--from", "2026-01-01"});
+  const Result built =
+      run({"build", "query", "customer", "--active", "all", "--from", "2026-01-01"});
   ASSERT_EQ(built.code, cli::kExitSuccess);
   EXPECT_EQ(run({"lint", "-"}, built.out).code, cli::kExitSuccess);
   const std::string misordered =

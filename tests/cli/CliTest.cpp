@@ -1,13 +1,13 @@
 // The droqbxml command run in-process: argument handling, output and exit codes, against
 // a fake processor registered under a ProgID of its own.
-#include "cli/Cli.hpp"
-
 #include <gtest/gtest.h>
 
 #include <sstream>
 
+#include "cli/Cli.hpp"
 #include "droqbxml/connection/RequestProcessor.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/cli/CliRunner.hpp"
 #include "tests/connection/FakeProcessor.hpp"
 
 namespace droqbxml {
@@ -15,11 +15,7 @@ namespace {
 
 constexpr TextView kFakeProgId = u"Test.FakeProcessor";
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
+using Result = test::CliResult;
 
 class CliTest : public ::testing::Test {
  protected:
@@ -33,19 +29,12 @@ class CliTest : public ::testing::Test {
     unregisterRequestProcessor(kRequestProcessorProgId);
   }
 
-  Result run(std::vector<std::string> args, const std::string& input = "") {
-    args.insert(args.begin(), "droqbxml");
-    std::vector<const char*> argv;
-    for (const auto& a : args) argv.push_back(a.c_str());
-    std::istringstream in(input);
-    std::ostringstream out;
-    std::ostringstream err;
-    const int code = cli::run(static_cast<int>(argv.size()), argv.data(), in, out, err);
-    return {code, out.str(), err.str()};
+  Result run(const std::vector<std::string>& args, const std::string& input = "") {
+    return test::runCli(args, input);
   }
   Result send(const std::vector<std::string>& extra, const std::string& input = "<request/>") {
-    std::vector<std::string> args{"--processor", "Test.FakeProcessor", "send", "-", "--company",
-                                  "C:\\co.qbw"};
+    std::vector<std::string> args{"--processor", "Test.FakeProcessor", "send",
+                                  "-",           "--company",          "C:\\co.qbw"};
     args.insert(args.end(), extra.begin(), extra.end());
     return run(args, input);
   }
@@ -66,16 +55,19 @@ TEST_F(CliTest, EscapesAndUnescapes) {
 TEST_F(CliTest, BuildsQueryDocuments) {
   const Result all = run({"build", "query", "item-inventory"});
   EXPECT_EQ(all.code, cli::kExitSuccess);
-  EXPECT_EQ(all.out,
-            "<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
-            ">\r\n<QBXML>\r\n\t<QBXMLMsgsRq onError=\"stopOnError\">\r\n\t\t<ItemInventoryQueryRq "
-            "requestID=\"2\" />\r\n\t</QBXMLMsgsRq>\r\n</QBXML>\n");
-  EXPECT_NE(run({"build", "query", "item", "--full-name", "Labor", "--item-kind", "service"})
-                .out.find("<ItemServiceQueryRq requestID=\"2\">\r\n\t\t\t<FullName>Labor</FullName>"),
-            std::string::npos);
-  EXPECT_NE(run({"build", "query", "customer", "--active", "all", "--from", "2004-01-01"})
-                .out.find("<ActiveStatus>All</ActiveStatus>\r\n\t\t\t<FromModifiedDate>2004-01-01<"),
-            std::string::npos);
+  EXPECT_EQ(
+      all.out,
+      "<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
+      ">\r\n<QBXML>\r\n\t<QBXMLMsgsRq onError=\"stopOnError\">\r\n\t\t<ItemInventoryQueryRq "
+      "requestID=\"2\" />\r\n\t</QBXMLMsgsRq>\r\n</QBXML>\n");
+  EXPECT_NE(
+      run({"build", "query", "item", "--full-name", "Labor", "--item-kind", "service"})
+          .out.find("<ItemServiceQueryRq requestID=\"2\">\r\n\t\t\t<FullName>Labor</FullName>"),
+      std::string::npos);
+  EXPECT_NE(
+      run({"build", "query", "customer", "--active", "all", "--from", "2004-01-01"})
+          .out.find("<ActiveStatus>All</ActiveStatus>\r\n\t\t\t<FromModifiedDate>2004-01-01<"),
+      std::string::npos);
   EXPECT_NE(run({"build", "query", "ACCOUNT", "--list-id", " 80000001-1 "})
                 .out.find("<CustomerQueryRq requestID=\"2\">\r\n\t\t\t<ListID>80000001-1</ListID>"),
             std::string::npos);
@@ -109,9 +101,9 @@ TEST_F(CliTest, SendsARequestAndReportsTheStatus) {
             "<QBXML><QBXMLMsgsRs><X statusCode=\"0\" /></QBXMLMsgsRs></QBXML>\n"
             "Response status: RSSuccess (0)\n");
   EXPECT_EQ(fake_->calls,
-            (std::vector<std::string>{"OpenConnection(4093-27-,Tessaly)", "BeginSession(C:\\co.qbw,2)",
-                                      "ProcessRequest(ticket-1)", "EndSession(ticket-1)",
-                                      "CloseConnection"}));
+            (std::vector<std::string>{"OpenConnection(4093-27-,Tessaly)",
+                                      "BeginSession(C:\\co.qbw,2)", "ProcessRequest(ticket-1)",
+                                      "EndSession(ticket-1)", "CloseConnection"}));
 
   fake_->process = [](const Text&) { return Text(u"<Rs statusCode=\"1\"/>\n"); };
   const Result none = send({});
@@ -130,9 +122,9 @@ TEST_F(CliTest, QueriesThroughTheBuilderWithTheHostsIdentity) {
     sent = request;
     return Text(u"<Rs statusCode=\"0\"/>");
   };
-  const Result result = run({"--processor", "Test.FakeProcessor", "--app-name", "Job Costing",
-                             "--app-id", "1111-22-", "query", "customer", "--full-name", "A&B",
-                             "--company", "C:\\co.qbw"});
+  const Result result =
+      run({"--processor", "Test.FakeProcessor", "--app-name", "Job Costing", "--app-id", "1111-22-",
+           "query", "customer", "--full-name", "A&B", "--company", "C:\\co.qbw"});
   EXPECT_EQ(result.code, cli::kExitSuccess) << result.err;
   EXPECT_EQ(fake_->calls.front(), "OpenConnection(1111-22-,Job Costing)");
   EXPECT_NE(sent.find(u"<FullName>A&amp;B</FullName>"), Text::npos);
