@@ -6,6 +6,7 @@
 #include "droqbxml/qbxml/DroXmlBuilder.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 #include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/Enumerator.hpp"
 
 namespace droqbxml {
 namespace {
@@ -27,16 +28,21 @@ bool isPosition(const Variant& v) {
 
 const ClassInfo& DroCustomerCol::typeInfo() {
   using C = DroCustomerCol;
-  static const ClassInfo info(u"DroCustomerCol",
-                              Members()
-                                  .method(u"Add", &C::Add)
-                                  .method(u"Item", &C::Item)
-                                  .getter(u"Count", &C::Count)
-                                  .method(u"Remove", &C::Remove)
-                                  .method(u"ParseCustInfoUnEscaped", &C::ParseCustInfoUnEscaped)
-                                  .method(u"ParseCustInfo", &C::ParseCustInfo)
-                                  .method(u"BuildCustInfoXML", &C::BuildCustInfoXML)
-                                  .take());
+  static const ClassInfo info(
+      u"DroCustomerCol",
+      Members()
+          .method(u"Add", &C::Add)
+          .method(u"Item", &C::Item)
+          .getter(u"Count", &C::Count)
+          .method(u"Remove", &C::Remove)
+          .custom(u"NewEnum", MemberKind::Method,
+                  [](Object& self, Arguments) {
+                    return Variant(Enumerator::over(static_cast<const C&>(self).NewEnum()));
+                  })
+          .method(u"ParseCustInfoUnEscaped", &C::ParseCustInfoUnEscaped)
+          .method(u"ParseCustInfo", &C::ParseCustInfo)
+          .method(u"BuildCustInfoXML", &C::BuildCustInfoXML)
+          .take());
   return info;
 }
 

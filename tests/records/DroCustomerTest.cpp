@@ -170,6 +170,15 @@ TEST(DroCustomerColTest, CollectsCustomersByKey) {
   EXPECT_TRUE(test::raisesRuntime([&] { col.Add(u"K"); }, RuntimeError::kDuplicateKey));
   EXPECT_TRUE(test::raisesRuntime([&] { col.Item(Variant(u"1")); },
                                   RuntimeError::kInvalidProcedureCall));  // text is a key
+  // By name, NewEnum gives an enumerator over a snapshot, as For Each sees it.
+  const auto byName = std::make_shared<DroCustomerCol>();
+  const auto a = byName->Add(u"A");
+  const auto b = byName->Add(u"B");
+  const auto each = byName->call(u"NewEnum").toObject();
+  byName->Remove(Variant(1));
+  EXPECT_EQ(each->call(u"Next").toObjectOf<DroCustomer>(), a);
+  EXPECT_EQ(each->call(u"Next").toObjectOf<DroCustomer>(), b);
+  EXPECT_TRUE(each->call(u"Next").isEmpty());
   col.Remove(Variant(u"K"));
   EXPECT_EQ(col.Count(), 1);
 }
