@@ -7,17 +7,17 @@
 namespace droqbxml {
 namespace {
 
-Text checked(const FieldSpec& spec, const Text& value) {
+Text checked(const FieldSpec& row, const Text& value) {
   using namespace basValidations;
-  switch (spec.check) {
+  switch (row.check) {
     case Check::None:
       return value;
     case Check::Str: {
       bool truncate = false;
-      return CheckSTRTYPE(value, static_cast<int16_t>(spec.arg), truncate);
+      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), truncate);
     }
     case Check::Int: {
-      int32_t mode = spec.arg;
+      int32_t mode = row.arg;
       return CheckINTTYPE(value, mode, 0, 0);
     }
     case Check::Bool:
@@ -55,14 +55,14 @@ Text Record::fieldValueUnescaped(size_t index) const {
 }
 
 void Record::setFieldValue(size_t index, const Text& value) {
-  const FieldSpec& spec = fields_[index];
-  if (spec.rule == Rule::KeepsStoredValue) {
+  const FieldSpec& row = fields_[index];
+  if (row.rule == Rule::KeepsStoredValue) {
     fieldStored(index);
     return;
   }
-  const Text trimmed = spec.trim == Trim::Spaces ? trim(value) : value;
-  const Text result = checked(spec, trimmed);
-  if (spec.rule == Rule::Specific) {
+  const Text trimmed = row.trim == Trim::Spaces ? trim(value) : value;
+  const Text result = checked(row, trimmed);
+  if (row.rule == Rule::Specific) {
     applyRule(index, result);
   } else {
     values_[index] = result;
