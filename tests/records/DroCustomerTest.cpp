@@ -72,6 +72,55 @@ TEST(DroCustomerTest, ReadsRealAddResponses) {
   EXPECT_EQ(unread.ListID(), u"");
 }
 
+TEST(DroCustomerTest, RealWarningsAndErrorsReadNothing) {
+  for (const char* name : {"CustomerQueryRs_500_Warn__qbwc-gem_test_helper.xml",
+                           "CustomerQueryRs_3120_Error__qbwc-gem_test_helper.xml"}) {
+    const Text response = readShared(name);
+    if (response.empty()) GTEST_SKIP() << "shared responses not found";
+    DroCustomer customer;
+    EXPECT_EQ(customer.ParseRs(response, 1), 1) << name;
+    EXPECT_EQ(customer.ListID(), u"");
+  }
+  // The iterator response's attributes stand on lines of their own: still one requestID.
+  const Text iterated = readShared("qbxml-gem__customer_query_terator_rs.xml");
+  DroCustomer tenth;
+  tenth.RequestID(u"1");
+  tenth.ParseRs(iterated);
+  EXPECT_EQ(tenth.Name(), u"10th Customer");
+  EXPECT_EQ(tenth.SalesTaxCodeRef()->FullName(), u"Tax");
+}
+
+TEST(DroCustomerTest, TruncatedAndOversizedInputEndInTheirErrors) {
+  // Cut inside an optional value: its start tag has no end tag, the cursor drops to 0, and
+  // the next read from it is the runtime's 5. Cut inside a required one: the empty-element
+  // error.
+  const Text full = queryResponse(u"2", customerRet(u"Kim", u"<CompanyName>Acme</CompanyName>"));
+  DroCustomer customer;
+  EXPECT_TRUE(test::raisesRuntime([&] { customer.ParseRs(full.substr(0, full.find(u"Acme") + 4)); },
+                                  RuntimeError::kInvalidProcedureCall));
+  EXPECT_EQ(customer.Sublevel(), u"0");
+  EXPECT_TRUE(
+      test::raises([&] { DroCustomer().ParseRs(full.substr(0, full.find(u"Kim</Name>") + 3)); },
+                   PARING, u"DroQbXml.basCommonProcs.getElementValue",
+                   u"The response returned a an empty '<CustomerRet><Name>'.\r\n"
+                   u"This element is not allowed to be empty."));
+  // A 10 MB value: kept where nothing limits it, refused where a limit does.
+  const Text huge(10'000'000, u'x');
+  DroCustomer big;
+  big.ParseRs(
+      queryResponse(u"2", customerRet(u"Big", u"<AccountNumber>" + huge + u"</AccountNumber>")));
+  EXPECT_EQ(big.AccountNumber().size(), huge.size());
+  DroCustomer refused;
+  EXPECT_THROW(refused.ParseRs(
+                   queryResponse(u"2", customerRet(u"Big", u"<JobDesc>" + huge + u"</JobDesc>"))),
+               ComError);
+  // An element carrying an attribute is not found under its name.
+  DroCustomer attributed;
+  attributed.ParseRs(
+      queryResponse(u"2", customerRet(u"A", u"<JobStatus x=\"1\">None</JobStatus>")));
+  EXPECT_EQ(attributed.JobStatus(), u"");
+}
+
 TEST(DroCustomerTest, FindsItsResponseByRequestIdentifier) {
   const Text batch = u"<QBXMLMsgsRs>" + queryResponse(u"6", customerRet(u"Six")) +
                      queryResponse(u"7", customerRet(u"Seven")) + u"</QBXMLMsgsRs>";
@@ -190,6 +239,26 @@ TEST(DroCustomerColTest, CustomerInfoTextOfAnEmptyCollection) {
       u">\r\n<QBXML>\r\n\t<QBXMLMsgsRs>\r\n\t\t<CustomerQueryRs requestID=\"2\" statusCode=\"0\" "
       u"statusSeverity=\"INFO\" statusMessage=\"Status OK\">\r\n\t\t</CustomerQueryRs>\r\n"
       u"\t<QBXMLMsgsRs>\r\n</QBXML>");
+}
+
+TEST(DroCustomerColTest, CustomerInfoTextOfOneCustomer) {
+  DroCustomerCol col;
+  const auto smith = col.Add();
+  smith->NonQbFileName(u"Smith.job");
+  smith->LastName(u"Smith");
+  smith->BillAddress()->City(u"Storrs");
+  EXPECT_EQ(
+      col.BuildCustInfoXML(),
+      u"<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
+      u">\r\n<QBXML>\r\n\t<QBXMLMsgsRs>\r\n\t\t<CustomerQueryRs requestID=\"2\" statusCode=\"0\" "
+      u"statusSeverity=\"INFO\" statusMessage=\"Status OK\">\r\n\t\t\t<CustomerRet>\r\n"
+      u"\t\t\t\t<NonQbFileName>Smith.job</NonQbFileName>\r\n\t\t\t\t<FirstName />\r\n"
+      u"\t\t\t\t<MiddleName />\r\n\t\t\t\t<LastName>Smith</LastName>\r\n"
+      u"\t\t\t\t<CompanyName />\r\n\t\t\t\t<BillAddress>\r\n\t\t\t\t\t<Addr1 />\r\n"
+      u"\t\t\t\t\t<Addr2 />\r\n\t\t\t\t\t<Addr3 />\r\n\t\t\t\t\t<City>Storrs</City>\r\n"
+      u"\t\t\t\t\t<State />\r\n\t\t\t\t\t<PostalCode />\r\n\t\t\t\t\t<Country />\r\n"
+      u"\t\t\t\t</BillAddress>\r\n\t\t\t\t<NonQbJobName />\r\n\t\t\t</CustomerRet>\r\n"
+      u"\t\t</CustomerQueryRs>\r\n\t<QBXMLMsgsRs>\r\n</QBXML>");
 }
 
 TEST(DroCustomerColTest, CustomerInfoRoundTripDropsDuplicateTitles) {
