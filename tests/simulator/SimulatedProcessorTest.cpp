@@ -5,8 +5,12 @@
 #include <sys/stat.h>
 
 #include <cstdlib>
+#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "droqbxml/connection/DroXmlSdkWrapper.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
@@ -22,33 +26,46 @@ namespace {
 using internal::SimulatedProcessor;
 namespace Hresult = internal::ProcessorHresult;
 
-constexpr TextView kSource = u"QBXMLRP.RequestProcessor.1";
-constexpr TextView kOpenConnectionNotCalled = u"The method \"OpenConnection\" has not been called.";
-constexpr TextView kBeginSessionNotCalled =
-    u"The \"BeginSession\" method has not been called or did not succeed.";
-constexpr TextView kCouldNotOpen = u"Could not open the specified QuickBooks company data file.";
-constexpr TextView kUnexpected =
-    u"Unexpected error. Check the qbsdk.log file for possible, additional information.";
-constexpr TextView kOtherFileOpen =
-    u"There is already a company data file open and it is different from the requested one.";
-constexpr TextView kAccessDenied =
+// A failure as QuickBooks raises it: its HRESULT and its text.
+struct Refusal {
+  int32_t hresult;
+  TextView text;
+};
+constexpr Refusal kNoConnection{Hresult::kUnexpected,
+                                u"The method \"OpenConnection\" has not been called."};
+constexpr Refusal kNoSession{
+    Hresult::kUnexpected, u"The \"BeginSession\" method has not been called or did not succeed."};
+constexpr Refusal kBadTicket{Hresult::kInvalidTicket, u"The ticket parameter is invalid."};
+constexpr Refusal kCannotOpen{Hresult::kCouldNotOpenFile,
+                              u"Could not open the specified QuickBooks company data file."};
+constexpr Refusal kUnexpected{
+    Hresult::kUnexpected,
+    u"Unexpected error. Check the qbsdk.log file for possible, additional information."};
+constexpr Refusal kOtherFileOpen{
+    Hresult::kOtherFileOpen,
+    u"There is already a company data file open and it is different from the requested one."};
+constexpr Refusal kAccessDenied{
+    Hresult::kAccessDenied,
     u"Access denied. This application does not have permission to access this QuickBooks "
     u"company data file. If access is required, the QuickBooks administrator can grant "
-    u"permission through Integrated Application preferences.";
-constexpr TextView kNoAutoLogin =
+    u"permission through Integrated Application preferences."};
+constexpr Refusal kNoAutoLogin{
+    Hresult::kNoAutoLogin,
     u"This application is not allowed to log into this QuickBooks company data file "
     u"automatically. The QuickBooks administrator can grant permission for automatic login "
-    u"through the Integrated Application preferences.";
+    u"through the Integrated Application preferences."};
+
+// Asserts that `body` raises `refusal` from the request processor.
+::testing::AssertionResult raises(const std::function<void()>& body, const Refusal& refusal) {
+  return test::raises(body, refusal.hresult, kRequestProcessorProgId, refusal.text);
+}
+#define EXPECT_REFUSED(call, refusal) EXPECT_TRUE(raises([&] { call; }, refusal))
 
 const Text kQuery =
     u"<?xml version=\"1.0\" ?>\n<?qbxml version=\"13.0\"?>\n<QBXML>\n"
     u"<QBXMLMsgsRq onError=\"stopOnError\">\n<CustomerQueryRq requestID=\"7\">\n"
     u"<FullName>Nobody Here</FullName>\n</CustomerQueryRq>\n</QBXMLMsgsRq>\n</QBXML>\n";
-
-::testing::AssertionResult raises(const std::function<void()>& body, int32_t hresult,
-                                  TextView text) {
-  return test::raises(body, hresult, kSource, text);
-}
+constexpr auto kAny = qbFileOpenDoNotCare;
 
 Text textOf(const std::filesystem::path& path) { return fromUtf8(path.string()); }
 
@@ -69,77 +86,49 @@ class SimulatedProcessorTest : public ::testing::Test {
   test::TemporaryFolder folder_;
 };
 
-TEST_F(SimulatedProcessorTest, StepsOutOfOrderRaiseTheVersionOneMessages) {
+TEST_F(SimulatedProcessorTest, SessionStepsOutOfOrderAndForeignTicketsAreRefused) {
   SimulatedProcessor processor;
   EXPECT_EQ(processor.MajorVersion(), 13);
   EXPECT_EQ(processor.MinorVersion(), 0);
-  EXPECT_TRUE(raises([&] { processor.BeginSession(file("a.qbw"), qbFileOpenDoNotCare); },
-                     Hresult::kUnexpected, kOpenConnectionNotCalled));
-  EXPECT_TRUE(raises([&] { processor.ProcessRequest(u"", kQuery); }, Hresult::kUnexpected,
-                     kOpenConnectionNotCalled));
-  EXPECT_TRUE(
-      raises([&] { processor.EndSession(u""); }, Hresult::kUnexpected, kBeginSessionNotCalled));
+  EXPECT_REFUSED(processor.BeginSession(file("a.qbw"), kAny), kNoConnection);
+  EXPECT_REFUSED(processor.ProcessRequest(u"", kQuery), kNoConnection);
+  EXPECT_REFUSED(processor.EndSession(u""), kNoSession);
 
+  // While no session is open, any ticket is "BeginSession has not been called".
+  const Text unknown = u"{11111111-2222-3333-4444-555555555555}";
   processor.OpenConnection(u"4093-27-", u"Tessaly");
-  EXPECT_TRUE(raises([&] { processor.ProcessRequest(u"", kQuery); }, Hresult::kUnexpected,
-                     kBeginSessionNotCalled));
-  EXPECT_TRUE(
-      raises([&] { processor.ProcessRequest(u"{00000000-0000-0000-0000-000000000000}", kQuery); },
-             Hresult::kUnexpected, kBeginSessionNotCalled));
+  EXPECT_REFUSED(processor.ProcessRequest(u"", kQuery), kNoSession);
+  EXPECT_REFUSED(processor.ProcessRequest(unknown, kQuery), kNoSession);
 
-  const Text ticket = processor.BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
+  const Text ticket = processor.BeginSession(file("a.qbw"), kAny);
   EXPECT_EQ(ticket.size(), 38u);
   EXPECT_EQ(processor.GetCurrentCompanyFileName(ticket), file("a.qbw"));
   EXPECT_NE(processor.ProcessRequest(ticket, kQuery).find(u"<CustomerQueryRs requestID=\"7\""),
             Text::npos);
-  processor.EndSession(ticket);
-
-  // An ended ticket is "BeginSession has not been called", for every step that takes one.
-  EXPECT_TRUE(raises([&] { processor.ProcessRequest(ticket, kQuery); }, Hresult::kUnexpected,
-                     kBeginSessionNotCalled));
-  EXPECT_TRUE(
-      raises([&] { processor.EndSession(ticket); }, Hresult::kUnexpected, kBeginSessionNotCalled));
-  EXPECT_TRUE(raises([&] { processor.GetCurrentCompanyFileName(ticket); }, Hresult::kUnexpected,
-                     kBeginSessionNotCalled));
-
-  // Closing the connection ends its sessions; their tickets are then spent.
-  const Text second = processor.BeginSession(file("a.qbw"), qbFileOpenSingleUser);
-  EXPECT_NE(second, ticket);
-  processor.CloseConnection();
-  EXPECT_TRUE(raises([&] { processor.ProcessRequest(second, kQuery); }, Hresult::kUnexpected,
-                     kOpenConnectionNotCalled));
-  EXPECT_TRUE(
-      raises([&] { processor.EndSession(second); }, Hresult::kUnexpected, kBeginSessionNotCalled));
-}
-
-TEST_F(SimulatedProcessorTest, ATicketItNeverGaveIsInvalidBesideOpenSessions) {
-  const auto processor = connected();
-  const Text ticket = processor->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  const Text unknown = u"{11111111-2222-3333-4444-555555555555}";
-  const Text invalid = u"The ticket parameter is invalid.";
-  EXPECT_TRUE(raises([&] { processor->ProcessRequest(unknown, kQuery); }, Hresult::kInvalidTicket,
-                     invalid));
-  EXPECT_TRUE(
-      raises([&] { processor->ProcessRequest(u"", kQuery); }, Hresult::kInvalidTicket, invalid));
-  EXPECT_TRUE(raises([&] { processor->EndSession(unknown); }, Hresult::kInvalidTicket, invalid));
-  EXPECT_TRUE(raises([&] { processor->GetCurrentCompanyFileName(unknown); },
-                     Hresult::kInvalidTicket, invalid));
-
-  // Another processor's ticket is not this one's.
+  // Beside open sessions, a ticket it never gave is invalid, another processor's too.
+  EXPECT_REFUSED(processor.ProcessRequest(unknown, kQuery), kBadTicket);
+  EXPECT_REFUSED(processor.ProcessRequest(u"", kQuery), kBadTicket);
+  EXPECT_REFUSED(processor.EndSession(unknown), kBadTicket);
+  EXPECT_REFUSED(processor.GetCurrentCompanyFileName(unknown), kBadTicket);
   const auto other = connected();
-  EXPECT_TRUE(raises([&] { other->ProcessRequest(ticket, kQuery); }, Hresult::kUnexpected,
-                     kBeginSessionNotCalled));
-  const Text own = other->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  EXPECT_TRUE(
-      raises([&] { other->ProcessRequest(ticket, kQuery); }, Hresult::kInvalidTicket, invalid));
+  EXPECT_REFUSED(other->ProcessRequest(ticket, kQuery), kNoSession);
+  const Text own = other->BeginSession(file("a.qbw"), kAny);
+  EXPECT_REFUSED(other->ProcessRequest(ticket, kQuery), kBadTicket);
   other->EndSession(own);
 
-  // An ended ticket stays "BeginSession has not been called" while other sessions are open.
-  const Text ended = processor->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  processor->EndSession(ended);
-  EXPECT_TRUE(raises([&] { processor->ProcessRequest(ended, kQuery); }, Hresult::kUnexpected,
-                     kBeginSessionNotCalled));
-  processor->EndSession(ticket);
+  // An ended ticket stays "BeginSession has not been called" for every step that takes one,
+  // also while other sessions are open.
+  const Text second = processor.BeginSession(file("a.qbw"), qbFileOpenSingleUser);
+  EXPECT_NE(second, ticket);
+  processor.EndSession(ticket);
+  EXPECT_REFUSED(processor.ProcessRequest(ticket, kQuery), kNoSession);
+  EXPECT_REFUSED(processor.EndSession(ticket), kNoSession);
+  EXPECT_REFUSED(processor.GetCurrentCompanyFileName(ticket), kNoSession);
+
+  // Closing the connection ends its sessions; their tickets are then spent.
+  processor.CloseConnection();
+  EXPECT_REFUSED(processor.ProcessRequest(second, kQuery), kNoConnection);
+  EXPECT_REFUSED(processor.EndSession(second), kNoSession);
 }
 
 TEST_F(SimulatedProcessorTest, CompanyFilesThatCannotBeUsed) {
@@ -150,18 +139,16 @@ TEST_F(SimulatedProcessorTest, CompanyFilesThatCannotBeUsed) {
   sqlite3_close(other);
 
   const auto processor = connected();
-  const auto begin = [&](const Text& path) { processor->BeginSession(path, qbFileOpenDoNotCare); };
-  EXPECT_TRUE(
-      raises([&] { begin(file("missing.qbw")); }, Hresult::kCouldNotOpenFile, kCouldNotOpen));
-  EXPECT_TRUE(
-      raises([&] { begin(textOf(folder_.root())); }, Hresult::kCouldNotOpenFile, kCouldNotOpen));
-  EXPECT_TRUE(raises([&] { begin(u""); }, Hresult::kCouldNotOpenFile, kCouldNotOpen));
-  EXPECT_TRUE(raises([&] { begin(file("letter.qbw")); }, Hresult::kUnexpected, kUnexpected));
-  EXPECT_TRUE(raises([&] { begin(file("other.db")); }, Hresult::kUnexpected, kUnexpected));
-
+  for (const auto& [path, refusal] :
+       std::vector<std::pair<Text, Refusal>>{{file("missing.qbw"), kCannotOpen},
+                                             {textOf(folder_.root()), kCannotOpen},
+                                             {u"", kCannotOpen},
+                                             {file("letter.qbw"), kUnexpected},
+                                             {file("other.db"), kUnexpected}}) {
+    EXPECT_REFUSED(processor->BeginSession(path, kAny), refusal) << toUtf8(path);
+  }
   // None of the failures left its file open for the process.
-  const Text ticket = processor->BeginSession(file("b.qbw"), qbFileOpenDoNotCare);
-  processor->EndSession(ticket);
+  processor->EndSession(processor->BeginSession(file("b.qbw"), kAny));
 
   // A file this user may not write cannot be opened.
   std::filesystem::permissions(folder_ / "a.qbw", std::filesystem::perms::owner_read |
@@ -170,10 +157,7 @@ TEST_F(SimulatedProcessorTest, CompanyFilesThatCannotBeUsed) {
   const int refused = test::runUnprivileged([&] {
     SimulatedProcessor unprivileged;
     unprivileged.OpenConnection(u"", u"Tessaly");
-    return raises([&] { unprivileged.BeginSession(file("a.qbw"), qbFileOpenDoNotCare); },
-                  Hresult::kCouldNotOpenFile, kCouldNotOpen)
-               ? 0
-               : 1;
+    return raises([&] { unprivileged.BeginSession(file("a.qbw"), kAny); }, kCannotOpen) ? 0 : 1;
   });
   if (refused != test::kCannotDropRights) {
     EXPECT_EQ(refused, 0);
@@ -183,32 +167,28 @@ TEST_F(SimulatedProcessorTest, CompanyFilesThatCannotBeUsed) {
 TEST_F(SimulatedProcessorTest, OneCompanyFileIsOpenInAProcessAtATime) {
   const auto first = connected(u"First");
   const auto second = connected(u"Second");
-  const Text onA = first->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  EXPECT_TRUE(raises([&] { second->BeginSession(file("b.qbw"), qbFileOpenDoNotCare); },
-                     Hresult::kOtherFileOpen, kOtherFileOpen));
+  const Text onA = first->BeginSession(file("a.qbw"), kAny);
+  EXPECT_REFUSED(second->BeginSession(file("b.qbw"), kAny), kOtherFileOpen);
   // The same file, however it is spelt, and the open file by an empty path.
-  const Text alsoOnA =
-      second->BeginSession(textOf(folder_.root() / "." / "a.qbw"), qbFileOpenDoNotCare);
-  const Text openOne = second->BeginSession(u"", qbFileOpenDoNotCare);
+  const Text alsoOnA = second->BeginSession(textOf(folder_.root() / "." / "a.qbw"), kAny);
+  const Text openOne = second->BeginSession(u"", kAny);
   EXPECT_EQ(second->GetCurrentCompanyFileName(openOne), file("a.qbw"));
   EXPECT_NE(second->ProcessRequest(openOne, kQuery).find(u"CustomerQueryRs"), Text::npos);
 
   first->EndSession(onA);
   second->EndSession(alsoOnA);
-  EXPECT_TRUE(raises([&] { first->BeginSession(file("b.qbw"), qbFileOpenDoNotCare); },
-                     Hresult::kOtherFileOpen, kOtherFileOpen));
+  EXPECT_REFUSED(first->BeginSession(file("b.qbw"), kAny), kOtherFileOpen);
   second->EndSession(openOne);
 
   // With every session on A ended, B can be opened; a processor dropped with a session
-  // open frees its file as well.
+  // open frees its file as well, and so does a closed connection.
   auto dropped = connected();
-  dropped->BeginSession(file("b.qbw"), qbFileOpenDoNotCare);
+  dropped->BeginSession(file("b.qbw"), kAny);
   dropped.reset();
-  const Text onB = first->BeginSession(file("b.qbw"), qbFileOpenDoNotCare);
+  const Text onB = first->BeginSession(file("b.qbw"), kAny);
   EXPECT_EQ(first->GetCurrentCompanyFileName(onB), file("b.qbw"));
   first->CloseConnection();
-  const Text againOnA = second->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  second->EndSession(againOnA);
+  second->EndSession(second->BeginSession(file("a.qbw"), kAny));
 }
 
 TEST_F(SimulatedProcessorTest, PlatformPathsAreMappedAsTheComponentMapsThem) {
@@ -217,13 +197,11 @@ TEST_F(SimulatedProcessorTest, PlatformPathsAreMappedAsTheComponentMapsThem) {
   CompanyFile::create(drive.path("Company Files/Orvanne.qbw"), {});
   const auto processor = connected();
   const Text path = u"C:\\Company Files\\Orvanne.qbw";
-  const Text ticket = processor->BeginSession(path, qbFileOpenDoNotCare);
+  const Text ticket = processor->BeginSession(path, kAny);
   EXPECT_EQ(processor->GetCurrentCompanyFileName(ticket), path);
   // The same file by its file-system path is the file already open.
-  const Text again =
-      processor->BeginSession(textOf(drive.path("Company Files/Orvanne.qbw")), qbFileOpenDoNotCare);
-  EXPECT_TRUE(raises([&] { processor->BeginSession(file("a.qbw"), qbFileOpenDoNotCare); },
-                     Hresult::kOtherFileOpen, kOtherFileOpen));
+  const Text again = processor->BeginSession(textOf(drive.path("Company Files/Orvanne.qbw")), kAny);
+  EXPECT_REFUSED(processor->BeginSession(file("a.qbw"), kAny), kOtherFileOpen);
   processor->EndSession(again);
   processor->EndSession(ticket);
 }
@@ -235,40 +213,34 @@ TEST_F(SimulatedProcessorTest, ApplicationsAreLetInAsTheCompanyFileSays) {
     company.setApplication("Attended", {true, false});
   }
   const auto newcomer = connected(u"Newcomer");
-  newcomer->EndSession(newcomer->BeginSession(file("a.qbw"), qbFileOpenDoNotCare));
-  {
-    CompanyFile company(folder_ / "a.qbw");
-    const auto added = company.application("Newcomer");
-    ASSERT_TRUE(added.has_value());
-    EXPECT_TRUE(added->allowed && added->autoLogin);
-  }
-  EXPECT_TRUE(
-      raises([&] { connected(u"Refused")->BeginSession(file("a.qbw"), qbFileOpenDoNotCare); },
-             Hresult::kAccessDenied, kAccessDenied));
-  EXPECT_TRUE(
-      raises([&] { connected(u"Attended")->BeginSession(file("a.qbw"), qbFileOpenDoNotCare); },
-             Hresult::kNoAutoLogin, kNoAutoLogin));
+  newcomer->EndSession(newcomer->BeginSession(file("a.qbw"), kAny));
+  EXPECT_REFUSED(connected(u"Refused")->BeginSession(file("a.qbw"), kAny), kAccessDenied);
+  EXPECT_REFUSED(connected(u"Attended")->BeginSession(file("a.qbw"), kAny), kNoAutoLogin);
   // A refused application does not keep the file open.
   const auto other = connected(u"Refused");
-  other->EndSession(other->BeginSession(file("b.qbw"), qbFileOpenDoNotCare));
+  other->EndSession(other->BeginSession(file("b.qbw"), kAny));
+  // A newcomer is added as allowed with automatic login; a refused one is left as it was.
   CompanyFile company(folder_ / "a.qbw");
+  const auto added = company.application("Newcomer");
+  ASSERT_TRUE(added.has_value());
+  EXPECT_TRUE(added->allowed && added->autoLogin);
   EXPECT_FALSE(company.application("Refused")->allowed);
 }
 
 TEST_F(SimulatedProcessorTest, RequestsAreCheckedThenAnsweredFromTheCompanyFile) {
   const auto processor = connected();
-  const Text ticket = processor->BeginSession(file("a.qbw"), qbFileOpenDoNotCare);
-  EXPECT_TRUE(raises([&] { processor->ProcessRequest(ticket, u"<QBXML><QBXMLMsgsRq>"); },
-                     Hresult::kParseError,
-                     u"QuickBooks found an error when parsing the provided XML text stream."));
+  const Text ticket = processor->BeginSession(file("a.qbw"), kAny);
+  EXPECT_REFUSED(processor->ProcessRequest(ticket, u"<QBXML><QBXMLMsgsRq>"),
+                 (Refusal{Hresult::kParseError,
+                          u"QuickBooks found an error when parsing the "
+                          u"provided XML text stream."}));
   EXPECT_FALSE(processor->lastProblems().empty());
 
-  const Text add =
-      u"<?xml version=\"1.0\" ?>\n<?qbxml version=\"13.0\"?>\n<QBXML>\n"
-      u"<QBXMLMsgsRq onError=\"stopOnError\">\n<CustomerAddRq requestID=\"2\">\n<CustomerAdd>\n"
-      u"<Name>Caf\u00e9 Zo\u00eb</Name>\n</CustomerAdd>\n</CustomerAddRq>\n</QBXMLMsgsRq>\n"
-      u"</QBXML>\n";
-  const Text response = processor->ProcessRequest(ticket, add);
+  const Text response = processor->ProcessRequest(
+      ticket,
+      u"<?xml version=\"1.0\" ?>\n<?qbxml version=\"13.0\"?>\n<QBXML>\n<QBXMLMsgsRq "
+      u"onError=\"stopOnError\">\n<CustomerAddRq requestID=\"2\">\n<CustomerAdd>\n<Name>Caf\u00e9 "
+      u"Zo\u00eb</Name>\n</CustomerAdd>\n</CustomerAddRq>\n</QBXMLMsgsRq>\n</QBXML>\n");
   EXPECT_TRUE(processor->lastProblems().empty());
   EXPECT_EQ(response.rfind(u"<?xml version=\"1.0\" ?>\n<QBXML>\n<QBXMLMsgsRs>\n", 0), 0u);
   EXPECT_NE(response.find(u"<CustomerAddRs requestID=\"2\" statusCode=\"0\""), Text::npos)
@@ -280,34 +252,26 @@ TEST_F(SimulatedProcessorTest, RequestsAreCheckedThenAnsweredFromTheCompanyFile)
   ASSERT_EQ(sqlite3_open((folder_ / "a.qbw").c_str(), &other), SQLITE_OK);
   test::sql(other, "DROP TABLE customers");
   sqlite3_close(other);
-  EXPECT_TRUE(raises([&] { processor->ProcessRequest(ticket, kQuery); }, Hresult::kUnexpected,
-                     kUnexpected));
+  EXPECT_REFUSED(processor->ProcessRequest(ticket, kQuery), kUnexpected);
   processor->EndSession(ticket);
 }
 
-// Restores the processor registrations a test changes.
-class RegistrationGuard {
- public:
-  RegistrationGuard()
-      : processor_(registeredRequestProcessor(kRequestProcessorProgId)),
-        simulator_(registeredRequestProcessor(kSimulatorProgId)) {}
+// Restores the processor registrations and the processor choice a test changes.
+struct RegistrationGuard {
+  RequestProcessorFactory processor = registeredRequestProcessor(kRequestProcessorProgId);
+  RequestProcessorFactory simulator = registeredRequestProcessor(kSimulatorProgId);
+  std::optional<std::string> choice = [] {
+    const char* value = std::getenv("DROQBXML_REQUEST_PROCESSOR");
+    return value ? std::optional<std::string>(value) : std::nullopt;
+  }();
   ~RegistrationGuard() {
-    restore(kRequestProcessorProgId, processor_);
-    restore(kSimulatorProgId, simulator_);
-  }
-  RegistrationGuard(const RegistrationGuard&) = delete;
-  RegistrationGuard& operator=(const RegistrationGuard&) = delete;
-
- private:
-  static void restore(TextView progId, const RequestProcessorFactory& factory) {
-    if (factory) {
-      registerRequestProcessor(progId, factory);
-    } else {
-      unregisterRequestProcessor(progId);
+    for (const auto& [progId, factory] :
+         {std::pair{kRequestProcessorProgId, processor}, std::pair{kSimulatorProgId, simulator}}) {
+      factory ? registerRequestProcessor(progId, factory) : unregisterRequestProcessor(progId);
     }
+    choice ? ::setenv("DROQBXML_REQUEST_PROCESSOR", choice->c_str(), 1)
+           : ::unsetenv("DROQBXML_REQUEST_PROCESSOR");
   }
-  RequestProcessorFactory processor_;
-  RequestProcessorFactory simulator_;
 };
 
 bool isSimulated(const std::shared_ptr<RequestProcessor>& processor) {
@@ -318,9 +282,6 @@ TEST_F(SimulatedProcessorTest, InstallationTakesQuickBooksPlaceOnlyWhenAsked) {
   const RegistrationGuard guard;
   unregisterRequestProcessor(kRequestProcessorProgId);
   unregisterRequestProcessor(kSimulatorProgId);
-  const char* previous = std::getenv("DROQBXML_REQUEST_PROCESSOR");
-  const std::string saved = previous ? previous : "";
-
   ::setenv("DROQBXML_REQUEST_PROCESSOR", "quickbooks", 1);
   EXPECT_FALSE(installIfRequested());
   EXPECT_TRUE(isSimulated(createRequestProcessor(kSimulatorProgId)));
@@ -333,21 +294,12 @@ TEST_F(SimulatedProcessorTest, InstallationTakesQuickBooksPlaceOnlyWhenAsked) {
   install();
   EXPECT_TRUE(isSimulated(createRequestProcessor(kRequestProcessorProgId)));
   EXPECT_NE(createProcessor(), createProcessor());
-
-  if (previous) {
-    ::setenv("DROQBXML_REQUEST_PROCESSOR", saved.c_str(), 1);
-  } else {
-    ::unsetenv("DROQBXML_REQUEST_PROCESSOR");
-  }
 }
 
 TEST_F(SimulatedProcessorTest, TheSessionWrapperUnderstandsItsMessages) {
   const RegistrationGuard guard;
   install();
-  {
-    CompanyFile company(folder_ / "b.qbw");
-    company.setApplication("Tessaly", {true, false});
-  }
+  CompanyFile(folder_ / "b.qbw").setApplication("Tessaly", {true, false});
   DroXmlSdkWrapper wrapper;
   // Without ConnectionOpen: the wrapper reads "OpenConnection has not been called" and
   // opens the connection itself.
