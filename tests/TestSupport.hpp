@@ -4,6 +4,7 @@
 #define DROQBXML_TESTS_TESTSUPPORT_HPP_
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <cstdint>
 #include <cstdlib>
@@ -15,8 +16,6 @@
 #include <ostream>
 #include <string>
 #include <utility>
-
-#include <unistd.h>
 
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Text.hpp"
@@ -46,9 +45,19 @@ inline ::testing::AssertionResult raises(const std::function<void()>& body, int3
   return ::testing::AssertionFailure() << "nothing was raised";
 }
 
+// Asserts that `body` raises a value check's refusal: number, source
+// "DroQbXml.basValidations." + check, and the checks' one message with `shown` and
+// `typeWords` in it.
+inline ::testing::AssertionResult raisesRefusal(const std::function<void()>& body, int32_t number,
+                                                TextView check, TextView shown,
+                                                TextView typeWords) {
+  return raises(body, number, Text(u"DroQbXml.basValidations.") + Text(check),
+                Text(u"The value '") + Text(shown) + u"' is not an allowable " + Text(typeWords) +
+                    u" value.  Please refer to the qbXML specifications.");
+}
+
 // Asserts that `body` raises the runtime's error `number` (source "DroQbXml").
-inline ::testing::AssertionResult raisesRuntime(const std::function<void()>& body,
-                                                int32_t number) {
+inline ::testing::AssertionResult raisesRuntime(const std::function<void()>& body, int32_t number) {
   return raises(body, number, u"DroQbXml", runtimeErrorDescription(number));
 }
 

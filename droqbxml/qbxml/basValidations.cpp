@@ -30,7 +30,8 @@ struct Refusal {
 constexpr TextView kSourcePrefix = u"DroQbXml.basValidations.";
 constexpr TextView kMessageStart = u"The value '";
 constexpr TextView kMessageMiddle = u"' is not an allowable ";
-// Two blanks before "Please": hosts show and compare the message as it always was.
+// The published refusal text, pointing users to Intuit's qbXML documents; two blanks before
+// "Please": hosts show and compare the message as it always was.
 constexpr TextView kMessageEnd = u" value.  Please refer to the qbXML specifications.";
 
 constexpr Refusal kWageRefusal{u"CheckWageType", TYPE_WAGE, u"Wage Type"};

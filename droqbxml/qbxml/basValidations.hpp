@@ -12,9 +12,9 @@ namespace droqbxml::basValidations {
 
 // Common to every check: the empty text passes and gives "". A refused value raises the
 // check's ERROR_NUMBER through the shared error object, with source
-// "DroQbXml.basValidations.<check>" and the description "The value '<value>' is not an
-// allowable <type words> value.  Please refer to the qbXML specifications.", where
-// <value> is the text the check received. Conversion failures of the runtime (13 type
+// "DroQbXml.basValidations.<check>" and the one refusal message of the module (built in
+// the .cpp from the value and the check's type words), where the value is the text the
+// check received. Conversion failures of the runtime (13 type
 // mismatch, 6 overflow) reach the caller unchanged unless a check says otherwise.
 
 // "Hourly" or "Salary", matched in any ASCII case and without trimming; TYPE_WAGE.

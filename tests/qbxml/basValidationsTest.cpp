@@ -27,9 +27,7 @@ using Check = Text (*)(const Text&);
 // the message.
 ::testing::AssertionResult refuses(const std::function<void()>& body, ERROR_NUMBER number,
                                    TextView check, TextView shown, TextView typeWords) {
-  return raises(body, number, Text(u"DroQbXml.basValidations.") + Text(check),
-                Text(u"The value '") + Text(shown) + u"' is not an allowable " + Text(typeWords) +
-                    u" value.  Please refer to the qbXML specifications.");
+  return test::raisesRefusal(body, number, check, shown, typeWords);
 }
 
 Text intCheck(const Text& value, int32_t mode, int32_t upper, int32_t lower) {

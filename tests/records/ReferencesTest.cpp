@@ -11,10 +11,7 @@ namespace droqbxml {
 namespace {
 
 bool raisesTooLong(const std::function<void()>& body, const Text& value) {
-  return test::raises(body, TYPE_STRING, u"DroQbXml.basValidations.CheckSTRTYPE",
-                      u"The value '" + value +
-                          u"' is not an allowable STRTYPE value.  Please refer to the qbXML "
-                          u"specifications.");
+  return test::raisesRefusal(body, TYPE_STRING, u"CheckSTRTYPE", value, u"STRTYPE");
 }
 
 TEST(DroObjRefTest, EmptinessFollowsEverySet) {
