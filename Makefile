@@ -7,10 +7,15 @@ all: test
 setup:
 	@bash scripts/setup-deps.sh
 
+# Every test twice: under the sanitizers, and in an ordinary optimised build where freed
+# memory is reused at once, as it is in a host.
 test: setup
 	cmake --preset test
 	cmake --build --preset test
 	ctest --preset test
+	cmake --preset ordinary
+	cmake --build --preset ordinary
+	ctest --preset ordinary
 
 bench: setup
 	cmake --preset release

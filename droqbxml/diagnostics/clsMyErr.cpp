@@ -12,10 +12,10 @@
 namespace droqbxml {
 namespace {
 
-// A late-bound error record argument: nothing, or an error object whose values it copies.
-std::optional<ErrorRecord> recordArgument(Arguments args, size_t at) {
-  if (at >= args.size() || args[at].isMissing()) return std::nullopt;
-  auto object = args[at].toObjectOf<clsMyErr>();
+// An error record argument: nothing, or an error object whose values it copies.
+std::optional<ErrorRecord> recordOf(const Variant& oErr) {
+  if (oErr.isMissing()) return std::nullopt;
+  auto object = oErr.toObjectOf<clsMyErr>();
   if (!object) return std::nullopt;
   return object->record();
 }
@@ -49,9 +49,8 @@ const ClassInfo& clsMyErr::typeInfo() {
           .method(u"Clear", &clsMyErr::Clear)
           .custom(u"Raise", MemberKind::Method,
                   [](Object& self, Arguments args) {
-                    const auto record = recordArgument(args, 0);
                     static_cast<clsMyErr&>(self).Raise(
-                        record ? &*record : nullptr, argument(args, 1), argument(args, 2),
+                        argument(args, 0), argument(args, 1), argument(args, 2),
                         argument(args, 3), argument(args, 4), argument(args, 5),
                         argument(args, 6));
                     return Variant();
@@ -59,15 +58,14 @@ const ClassInfo& clsMyErr::typeInfo() {
           .method(u"SetErrorInfo", &clsMyErr::SetErrorInfo)
           .custom(u"SetError", MemberKind::Method,
                   [](Object& self, Arguments args) {
-                    const auto record = recordArgument(args, 0);
+                    const auto record = recordOf(argument(args, 0));
                     static_cast<clsMyErr&>(self).SetError(
                         record.value_or(ErrorRecord{}), argument(args, 1).toText());
                     return Variant();
                   })
           .custom(u"LogError", MemberKind::Method,
                   [](Object& self, Arguments args) {
-                    const auto record = recordArgument(args, 0);
-                    static_cast<clsMyErr&>(self).LogError(record ? &*record : nullptr);
+                    static_cast<clsMyErr&>(self).LogError(argument(args, 0));
                     return Variant();
                   })
           .take());
@@ -83,13 +81,20 @@ void clsMyErr::Clear() {
   source_.clear();
 }
 
-void clsMyErr::Raise(const ErrorRecord* oErr, const Variant& lNumber, const Variant& sSource,
+void clsMyErr::Raise(const ErrorRecord& oErr) {
+  // The record's description is passed as the source: hosts have always seen it so.
+  SetError(oErr, oErr.Description);
+  if (number_ != 0) raiseError(number_, source_, description_);
+}
+
+void clsMyErr::Raise(const Variant& oErr, const Variant& lNumber, const Variant& sSource,
                      const Variant& sDescription, const Variant& sHelpFile,
                      const Variant& sHelpContext, const Variant& lLastDllError) {
-  if (oErr) {
-    // The record's description is passed as the source: hosts have always seen it so.
-    SetError(*oErr, oErr->Description);
-  } else if (!lNumber.isMissing()) {
+  if (const auto record = recordOf(oErr)) {
+    Raise(*record);
+    return;
+  }
+  if (!lNumber.isMissing()) {
     // Not cleared first: a value left out keeps the previous error's.
     number_ = lNumber.toLong();
     if (!sSource.isMissing()) source_ = sSource.toText();
@@ -122,8 +127,16 @@ void clsMyErr::SetError(const ErrorRecord& ErrObj, const Text& Source) {
   source_ = Source;
 }
 
-void clsMyErr::LogError(const ErrorRecord* oErr) {
-  if (oErr) SetError(*oErr, oErr->Source);
+void clsMyErr::LogError(const ErrorRecord& oErr) {
+  SetError(oErr, oErr.Source);
+  appendErrorLog(number_, source_, description_);
+}
+
+void clsMyErr::LogError(const Variant& oErr) {
+  if (const auto record = recordOf(oErr)) {
+    LogError(*record);
+    return;
+  }
   appendErrorLog(number_, source_, description_);
 }
 
@@ -144,7 +157,7 @@ ErrorRecord clsMyErr::record() const {
 }
 
 void raiseComponentError(ERROR_NUMBER number, Text source, Text description) {
-  basGlobals::SharedErrorObject()->Raise(nullptr, Variant(static_cast<int32_t>(number)),
+  basGlobals::SharedErrorObject()->Raise(Variant::missing(), Variant(static_cast<int32_t>(number)),
                                          Variant(std::move(source)),
                                          Variant(std::move(description)));
   // Raise returns only for number 0, which no ERROR_NUMBER member has.

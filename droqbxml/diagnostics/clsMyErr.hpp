@@ -38,13 +38,16 @@ class clsMyErr final : public Object {
   // Stores a given error record (its description also becomes the source, as hosts have
   // always seen it), or else the given values over the previous ones (left-out values keep
   // the previous error's), then raises Number, Source and Description when Number is not
-  // 0. With Number 0 it returns normally.
-  void Raise(const ErrorRecord* oErr = nullptr, const Variant& lNumber = Variant::missing(),
+  // 0. With Number 0 it returns normally. oErr is left out, empty or nothing, or an error
+  // object whose values stand for the record (anything else is the runtime's 13).
+  void Raise(const Variant& oErr = Variant::missing(), const Variant& lNumber = Variant::missing(),
              const Variant& sSource = Variant::missing(),
              const Variant& sDescription = Variant::missing(),
              const Variant& sHelpFile = Variant::missing(),
              const Variant& sHelpContext = Variant::missing(),
              const Variant& lLastDllError = Variant::missing());
+  // The same with the platform's error record (a caught ComError's record()).
+  void Raise(const ErrorRecord& oErr);
 
   // Clear, then store each value given. Never raises: a value that does not convert is
   // left cleared.
@@ -59,7 +62,9 @@ class clsMyErr final : public Object {
 
   // Copies the record when given, then appends one record to "Logs\ErrorLog.txt" under the
   // installation path. A log that cannot be opened or written raises the file error.
-  void LogError(const ErrorRecord* oErr = nullptr);
+  // oErr as for Raise.
+  void LogError(const Variant& oErr = Variant::missing());
+  void LogError(const ErrorRecord& oErr);
 
   // The stored values as an error record.
   ErrorRecord record() const;

@@ -209,7 +209,8 @@ Text CheckDATETYPE(const Text& value) {
 
 Text CheckDATETIMETYPE(const Text& value) { return value; }
 
-Text CheckINTTYPE(const Text& value, int32_t& mode, int32_t upper, int32_t lower) {
+Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
+                 const int32_t& lower) {
   if (value.empty()) return {};
   const int32_t number = textToLong(value);
   const bool refused = (mode == kIntLengthMode && static_cast<int64_t>(value.size()) > upper) ||
@@ -235,7 +236,7 @@ Text CheckQUANTYPE(const Text& value) {
   return formatFixed(*quantity, 5);
 }
 
-Text CheckSTRTYPE(const Text& value, int16_t maxLen, bool& truncate) {
+Text CheckSTRTYPE(const Text& value, const int16_t& maxLen, const bool& truncate) {
   if (value.empty()) return {};
   if (maxLen >= 1 && value.size() > static_cast<size_t>(maxLen)) {
     if (!truncate) refuse(kStringRefusal, value);

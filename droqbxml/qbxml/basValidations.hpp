@@ -50,8 +50,9 @@ Text CheckDATETIMETYPE(const Text& value);
 // A 32-bit integer in decimal ("007" gives "7"); text that does not convert is the
 // runtime's 13, or 6 beyond the 32-bit range. Mode 1 refuses a value text longer than
 // `upper` characters, mode 2 a number outside `lower` .. `upper`; other modes check nothing
-// more. TYPE_INT. `mode` is passed by reference and left unchanged.
-Text CheckINTTYPE(const Text& value, int32_t& mode, int32_t upper, int32_t lower);
+// more. TYPE_INT.
+Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
+                 const int32_t& lower);
 
 // A price: converted to currency (four decimals kept, half to even; 13 for non-numeric
 // text, 6 beyond the currency range), at most 10 digits before the decimal point, a
@@ -67,8 +68,7 @@ Text CheckQUANTYPE(const Text& value);
 
 // A text of at most `maxLen` characters (no limit when maxLen < 1). A longer value is cut
 // to maxLen characters when `truncate` is true and refused (TYPE_STRING) when it is false.
-// `truncate` is passed by reference and left unchanged.
-Text CheckSTRTYPE(const Text& value, int16_t maxLen, bool& truncate);
+Text CheckSTRTYPE(const Text& value, const int16_t& maxLen, const bool& truncate);
 
 // Accepts every value unchanged (a text without length limit).
 Text CheckIDTYPE(const Text& value);

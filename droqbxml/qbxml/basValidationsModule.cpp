@@ -10,8 +10,7 @@
 namespace droqbxml {
 namespace {
 
-// A late-bound call of a free function: arguments converted as for member functions,
-// non-const references written back.
+// A late-bound call of a free function: arguments converted as for member functions.
 template <class R, class... A>
 MemberCall callFree(R (*fn)(A...)) {
   return [fn](Object&, Arguments args) {

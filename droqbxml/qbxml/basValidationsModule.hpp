@@ -1,7 +1,5 @@
 // basValidationsModule: the value checks of basValidations for late-bound hosts, created as
-// "DroQbXml.basValidations". Each check is a method of the same name and arguments; the
-// by-reference arguments (CheckINTTYPE's mode, CheckSTRTYPE's truncate flag) are written
-// back into their argument slots.
+// "DroQbXml.basValidations". Each check is a method of the same name and arguments.
 #ifndef DROQBXML_QBXML_BASVALIDATIONSMODULE_HPP_
 #define DROQBXML_QBXML_BASVALIDATIONSMODULE_HPP_
 

@@ -7,16 +7,7 @@
 
 namespace droqbxml {
 
-DroCustomer::DroCustomer()
-    : parentRef_(std::make_shared<DroParentRef>()),
-      billAddress_(std::make_shared<DroAddress>()),
-      customerTypeRef_(std::make_shared<DroCustomerTypeRef>()),
-      shipAddress_(std::make_shared<DroAddress>()),
-      termsRef_(std::make_shared<DroTermsRef>()),
-      salesRepRef_(std::make_shared<DroSalesRepRef>()),
-      salesTaxCodeRef_(std::make_shared<DroSalesTaxCodeRef>()),
-      itemSalesTaxRef_(std::make_shared<DroItemSalesTaxRef>()),
-      jobTypeRef_(std::make_shared<DroJobTypeRef>()) {}
+DroCustomer::DroCustomer() = default;
 
 const ClassInfo& DroCustomer::typeInfo() {
   using C = DroCustomer;

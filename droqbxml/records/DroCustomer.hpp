@@ -70,23 +70,23 @@ class DroCustomer final : public RecordOf<DroCustomer> {
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
   // Sub-records, created with the customer and replaceable.
-  const Ref<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
-  const Ref<DroAddress>& BillAddress() const { return billAddress_; }
+  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_; }
   void BillAddress(Ref<DroAddress> v) { billAddress_ = std::move(v); }
-  const Ref<DroCustomerTypeRef>& CustomerTypeRef() const { return customerTypeRef_; }
+  const ObjectProperty<DroCustomerTypeRef>& CustomerTypeRef() const { return customerTypeRef_; }
   void CustomerTypeRef(Ref<DroCustomerTypeRef> v) { customerTypeRef_ = std::move(v); }
-  const Ref<DroAddress>& ShipAddress() const { return shipAddress_; }
+  const ObjectProperty<DroAddress>& ShipAddress() const { return shipAddress_; }
   void ShipAddress(Ref<DroAddress> v) { shipAddress_ = std::move(v); }
-  const Ref<DroTermsRef>& TermsRef() const { return termsRef_; }
+  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_; }
   void TermsRef(Ref<DroTermsRef> v) { termsRef_ = std::move(v); }
-  const Ref<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_; }
+  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_; }
   void SalesRepRef(Ref<DroSalesRepRef> v) { salesRepRef_ = std::move(v); }
-  const Ref<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
-  const Ref<DroItemSalesTaxRef>& ItemSalesTaxRef() const { return itemSalesTaxRef_; }
+  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const { return itemSalesTaxRef_; }
   void ItemSalesTaxRef(Ref<DroItemSalesTaxRef> v) { itemSalesTaxRef_ = std::move(v); }
-  const Ref<DroJobTypeRef>& JobTypeRef() const { return jobTypeRef_; }
+  const ObjectProperty<DroJobTypeRef>& JobTypeRef() const { return jobTypeRef_; }
   void JobTypeRef(Ref<DroJobTypeRef> v) { jobTypeRef_ = std::move(v); }
 
   // The collection this customer belongs to; a new empty one is created on first read.
@@ -206,15 +206,15 @@ class DroCustomer final : public RecordOf<DroCustomer> {
  private:
   void applyRule(size_t index, const Text& checked) override;
 
-  Ref<DroParentRef> parentRef_;
-  Ref<DroAddress> billAddress_;
-  Ref<DroCustomerTypeRef> customerTypeRef_;
-  Ref<DroAddress> shipAddress_;
-  Ref<DroTermsRef> termsRef_;
-  Ref<DroSalesRepRef> salesRepRef_;
-  Ref<DroSalesTaxCodeRef> salesTaxCodeRef_;
-  Ref<DroItemSalesTaxRef> itemSalesTaxRef_;
-  Ref<DroJobTypeRef> jobTypeRef_;
+  ObjectProperty<DroParentRef> parentRef_;
+  ObjectProperty<DroAddress> billAddress_;
+  ObjectProperty<DroCustomerTypeRef> customerTypeRef_;
+  ObjectProperty<DroAddress> shipAddress_;
+  ObjectProperty<DroTermsRef> termsRef_;
+  ObjectProperty<DroSalesRepRef> salesRepRef_;
+  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
+  ObjectProperty<DroJobTypeRef> jobTypeRef_;
   mutable Ref<droqbxml::DroCustomerCol> collection_;
 };
 

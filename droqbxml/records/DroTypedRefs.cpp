@@ -28,9 +28,8 @@ void DroTypedRef<Kind>::ListID(const Text& value) {
 
 template <RefKind Kind>
 void DroTypedRef<Kind>::FullName(const Text& value) {
-  bool truncate = false;
   const Text given = kSpec.trimsFullName ? trim(value) : value;
-  inner_->FullName(basValidations::CheckSTRTYPE(given, kSpec.fullNameMaxLength, truncate));
+  inner_->FullName(basValidations::CheckSTRTYPE(given, kSpec.fullNameMaxLength, false));
 }
 
 template <RefKind Kind>

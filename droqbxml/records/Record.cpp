@@ -3,6 +3,7 @@
 
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 #include "droqbxml/qbxml/basValidations.hpp"
+#include "droqbxml/records/basCommonProcs.hpp"
 
 namespace droqbxml {
 namespace {
@@ -12,14 +13,16 @@ Text checked(const FieldSpec& row, const Text& value) {
   switch (row.check) {
     case Check::None:
       return value;
-    case Check::Str: {
-      bool truncate = false;
-      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), truncate);
-    }
-    case Check::Int: {
-      int32_t mode = row.arg;
-      return CheckINTTYPE(value, mode, 0, 0);
-    }
+    case Check::Str:
+      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), false);
+    case Check::StrCut:
+      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), true);
+    case Check::Int:
+      return CheckINTTYPE(value, row.arg, 0, 0);
+    case Check::IntLength:
+      return CheckINTTYPE(value, 1, row.arg, 0);
+    case Check::IntRange:
+      return CheckINTTYPE(value, 2, row.arg, 0);
     case Check::Bool:
       return CheckBOOLTYPE(value);
     case Check::Date:
@@ -47,6 +50,21 @@ Text checked(const FieldSpec& row, const Text& value) {
 }
 
 }  // namespace
+
+OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView returnTag,
+                            const Text& requestId) {
+  using basCommonProcs::findInResponse;
+  const int32_t start = startPoint < 1 ? 1 : startPoint;
+  if (findInResponse(start, value, returnTag) == 0) return {false, 0, 0};
+  const int32_t attribute = findInResponse(start, value, u"requestID=");
+  const int32_t open = attribute == 0 ? 0 : findInResponse(attribute, value, u"\"");
+  const int32_t close = open == 0 ? 0 : findInResponse(open + 1, value, u"\"");
+  if (close == 0) return {false, start, 0};
+  const TextView id =
+      TextView(value).substr(static_cast<size_t>(open), static_cast<size_t>(close - open - 1));
+  if (!requestId.empty() && id != requestId) return {false, close, 0};
+  return {true, start, close};
+}
 
 Record::Record(std::span<const FieldSpec> fields) : fields_(fields), values_(fields.size()) {}
 

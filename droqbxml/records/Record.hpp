@@ -16,6 +16,7 @@
 #include <vector>
 
 #include "droqbxml/runtime/Binding.hpp"
+#include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Object.hpp"
 #include "droqbxml/runtime/Text.hpp"
 
@@ -24,11 +25,15 @@ namespace droqbxml {
 enum class Trim : uint8_t { None, Spaces };
 
 // The value check a setter applies after trimming (see basValidations); arg is the maximum
-// length for Str (0: none) and the mode for Int.
+// length for Str and StrCut (0: none), the mode for Int, the longest text for IntLength and
+// the highest value for IntRange (whose lowest is 0).
 enum class Check : uint8_t {
   None,
   Str,
+  StrCut,  // a longer text is cut to arg characters without an error
   Int,
+  IntLength,
+  IntRange,
   Bool,
   Date,
   DateTime,
@@ -76,6 +81,43 @@ consteval size_t fieldIndex(const std::array<FieldSpec, K>& fields, std::u16stri
   }
   throw "no field of that name in this record";  // a compile-time error in a consteval call
 }
+
+// An object property of a record (a reference, an address, a companion record, a line
+// collection): created with the record, replaceable by the host, "nothing" included
+// (Set rec.BillAddress = Nothing). It hands out the reference as it is; whatever uses the
+// sub-record through it (the record's parse and dump, the builders) gets the runtime's 91
+// when it holds nothing, as a call through an unset object variable does on the platform.
+template <class T>
+class ObjectProperty : public Ref<T> {
+ public:
+  ObjectProperty() : Ref<T>(std::make_shared<T>()) {}
+  ObjectProperty& operator=(Ref<T> other) {
+    Ref<T>::operator=(std::move(other));
+    return *this;
+  }
+  T& operator*() const { return *used(); }
+  T* operator->() const { return used(); }
+
+ private:
+  T* used() const {
+    if (!this->get()) raiseRuntimeError(RuntimeError::kObjectNotSet);
+    return this->get();
+  }
+};
+
+// Where a list record's own response is, for the records that are found by their return
+// element and the first "requestID=" after the start (accounts and items). Either the
+// record is to be read from `cursor`, or `result` is what its ParseRs returns at once.
+struct OwnResponse {
+  bool found = false;
+  int32_t result = 0;  // the clamped start when found
+  int32_t cursor = 0;  // the closing quote of the request identifier
+};
+// From StartPoint (raised to 1): 0 without returnTag; the start without "requestID=" (or
+// with its quotes cut short); the closing-quote position when the identifier is another
+// request's and requestId is not ""; otherwise found.
+OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView returnTag,
+                            const Text& requestId);
 
 // The base of every record with a field table: values, the set path and the late-bound
 // members of the fields.

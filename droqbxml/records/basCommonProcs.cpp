@@ -41,11 +41,6 @@ int32_t findInResponse(int32_t start, const Text& text, TextView what) {
   return at == Text::npos ? 0 : static_cast<int32_t>(at + 1);
 }
 
-Text getElementValue(const Text& Value, const Text& ElementName, int32_t& StartPoint,
-                     int32_t& EndPoint, bool Required, const Text& Parent) {
-  return getElementValue(Value, TextView(ElementName), StartPoint, EndPoint, Required, Parent);
-}
-
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent) {
   const int32_t cursor = EndPoint;

@@ -18,11 +18,8 @@ namespace droqbxml::basCommonProcs {
 //   and the content is returned as it stands (no trimming, no unescaping).
 // - Absent: "", StartPoint = the cursor, EndPoint unchanged.
 // An empty result with Required raises PARING from "DroQbXml.basCommonProcs.getElementValue"
-// naming Parent + "<N>". A cursor below 1 is the runtime's 5.
-Text getElementValue(const Text& Value, const Text& ElementName, int32_t& StartPoint,
-                     int32_t& EndPoint, bool Required, const Text& Parent);
-
-// The same for names and parents held as views (the records' own tables).
+// naming Parent + "<N>". A cursor below 1 is the runtime's 5. Names and parents are taken
+// as views, so literals, texts and the records' own tables all pass without copies.
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent);
 

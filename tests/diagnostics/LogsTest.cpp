@@ -52,7 +52,7 @@ TEST_F(LogsTest, ErrorLogAppendsAndCopiesAGivenRecord) {
   record.Number = 53;
   record.Source = u"Host";
   record.Description = u"caf\u00e9";
-  err.LogError(&record);
+  err.LogError(record);
   EXPECT_EQ(err.Source(), u"Host");
   EXPECT_EQ(readFile(drive_.path("Apps/Logs/ErrorLog.txt")),
             std::string(kFirstRecord) +

@@ -25,15 +25,15 @@ ErrorRecord sampleRecord() {
 
 TEST(clsMyErrTest, RaiseStoresTheGivenValuesOverThePreviousOnes) {
   clsMyErr err;
-  EXPECT_TRUE(raises([&] { err.Raise(nullptr, TYPE_DATE, u"A.B", u"bad", u"first.chm", u"7"); },
+  EXPECT_TRUE(raises([&] { err.Raise(Variant::missing(), TYPE_DATE, u"A.B", u"bad", u"first.chm", u"7"); },
                      TYPE_DATE, u"A.B", u"bad"));
   // Left-out values keep the previous error's.
-  EXPECT_TRUE(raises([&] { err.Raise(nullptr, TYPE_BOOL, Variant::missing(), u"worse"); },
+  EXPECT_TRUE(raises([&] { err.Raise(Variant::missing(), TYPE_BOOL, Variant::missing(), u"worse"); },
                      TYPE_BOOL, u"A.B", u"worse"));
   EXPECT_EQ(err.HelpFile(), u"first.chm");
   EXPECT_EQ(err.HelpContext(), u"7");
   // Number 0 stores and returns without raising.
-  err.Raise(nullptr, 0, Variant::missing(), u"nothing wrong");
+  err.Raise(Variant::missing(), 0, Variant::missing(), u"nothing wrong");
   EXPECT_EQ(err.Number(), 0);
   EXPECT_EQ(err.Description(), u"nothing wrong");
   // Nothing given: nothing stored, and with Number 0 nothing raised.
@@ -44,7 +44,7 @@ TEST(clsMyErrTest, RaiseStoresTheGivenValuesOverThePreviousOnes) {
 TEST(clsMyErrTest, RaiseWithARecordStoresItsDescriptionAsTheSource) {
   clsMyErr err;
   const ErrorRecord record = sampleRecord();
-  EXPECT_TRUE(raises([&] { err.Raise(&record); }, 53, u"File not found", u"File not found"));
+  EXPECT_TRUE(raises([&] { err.Raise(record); }, 53, u"File not found", u"File not found"));
   EXPECT_EQ(err.HelpContext(), u"1234");
   EXPECT_EQ(err.LastDllError(), 2);
 }

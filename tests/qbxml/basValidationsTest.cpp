@@ -318,13 +318,9 @@ TEST(basValidationsTest, ChecksAreReachableByName) {
   std::vector<Variant> intArgs{Variant(u"007"), Variant(int32_t{2}), Variant(int32_t{10}),
                                Variant(int32_t{1})};
   EXPECT_EQ(module->invoke(u"CheckINTTYPE", MemberKind::Method, intArgs).toText(), u"7");
-  EXPECT_EQ(intArgs[1].kind(), Variant::Kind::Long);  // the in/out mode is written back
-  EXPECT_EQ(intArgs[1].toLong(), 2);
 
   std::vector<Variant> strArgs{Variant(u"ABCDEF"), Variant(int16_t{3}), Variant(true)};
   EXPECT_EQ(module->invoke(u"CheckSTRTYPE", MemberKind::Method, strArgs).toText(), u"ABC");
-  EXPECT_EQ(strArgs[2].kind(), Variant::Kind::Boolean);
-  EXPECT_TRUE(strArgs[2].toBoolean());
 
   EXPECT_TRUE(refuses([&] { module->call(u"CheckJobStatus", {Variant(u"Lost")}); }, JOB_STATUS,
                       u"CheckJobStatus", u"Lost", u"job status"));

@@ -6,6 +6,7 @@
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/qbxml/DroXmlBuilder.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
 #include "tests/TestSupport.hpp"
 
@@ -205,6 +206,58 @@ TEST(DroCustomerTest, ReachableByName) {
   EXPECT_GT(customer->call(u"ParseRs", {Variant(response)}).toLong(), 0);
   EXPECT_EQ(customer->get(u"FullName").toText(), u"Lee");
   EXPECT_EQ(customer->get(u"DroCustomerCol").toObject()->get(u"Count").toLong(), 0);
+}
+
+// Two large responses of one length, read one after the other through the late-bound
+// surface (which copies the text into a temporary each call): the second read sees the
+// second text.
+TEST(DroCustomerTest, EachResponseIsReadAsItIs) {
+  Text phones;
+  Text mobiles;
+  for (int i = 0; i < 200; ++i) {
+    phones += customerRet(u"C" + asciiText(std::to_string(1000 + i)), u"<Phone>555-1234</Phone>");
+    mobiles += customerRet(u"C" + asciiText(std::to_string(1000 + i)), u"<Mobile>5-1234</Mobile>");
+  }
+  Text response = queryResponse(u"2", phones);
+  const Text second = queryResponse(u"2", mobiles);
+  ASSERT_GT(response.size(), 32768u);
+  ASSERT_EQ(response.size(), second.size());
+  DroCustomer typed;
+  typed.ParseRs(response);
+  EXPECT_EQ(typed.Phone(), u"555-1234");
+  response.assign(second);  // the same string, its buffer kept
+  typed.ParseRs(response);
+  EXPECT_EQ(typed.Mobile(), u"5-1234");
+  // By name the text is copied into a temporary each call; in an ordinary build the second
+  // temporary takes the first one's freed buffer.
+  const auto customer = CreateObject(u"DroQbXml.DroCustomer");
+  customer->call(u"ParseRs", {Variant(queryResponse(u"2", phones))});
+  EXPECT_EQ(customer->get(u"Phone").toText(), u"555-1234");
+  customer->call(u"ParseRs", {Variant(second)});
+  EXPECT_EQ(customer->get(u"Mobile").toText(), u"5-1234");
+}
+
+// Set cust.BillAddress = Nothing: whatever uses the address raises 91, nothing crashes.
+TEST(DroCustomerTest, ObjectPropertySetToNothingIsAnErrorWhereItIsUsed) {
+  const auto customer = std::make_shared<DroCustomer>();
+  customer->set(u"BillAddress", Variant());
+  EXPECT_EQ(customer->BillAddress(), nullptr);
+  EXPECT_TRUE(customer->get(u"BillAddress").toObject() == nullptr);
+  const auto unset = [](const std::function<void()>& body) {
+    return test::raisesRuntime(body, RuntimeError::kObjectNotSet);
+  };
+  EXPECT_TRUE(unset([&] { customer->PrintOut(); }));
+  EXPECT_TRUE(unset([&] { customer->ParseRs(queryResponse(u"2", customerRet(u"Lee"))); }));
+  EXPECT_TRUE(unset([&] { customer->ParseCustInfo(u"<CustomerRet><NonQbFileName>f"
+                                                  u"</NonQbFileName></CustomerRet>"); }));
+  DroXmlBuilder builder;
+  EXPECT_TRUE(unset([&] { builder.BuildAddCustomer(customer); }));
+  const auto col = std::make_shared<DroCustomerCol>();
+  col->Add(u"", customer);
+  EXPECT_TRUE(unset([&] { col->BuildCustInfoXML(); }));
+  customer->ParentRef(nullptr);
+  customer->BillAddress(std::make_shared<DroAddress>());
+  EXPECT_TRUE(unset([&] { customer->PrintOut(); }));
 }
 
 TEST(DroCustomerColTest, CollectsCustomersByKey) {

@@ -1,5 +1,5 @@
 // getElementValue: its window for self-closing tags, its unbounded forward search, its
-// cursor, its empty-element error, and the tag index that keeps repeated searches cheap.
+// cursor, its empty-element error, and the literal search under it.
 #include <gtest/gtest.h>
 
 #include <random>
@@ -80,7 +80,7 @@ TEST(basCommonProcsTest, StartTagWithoutEndTagLeavesTheCursorAtZero) {
                                   RuntimeError::kInvalidProcedureCall));
 }
 
-TEST(basCommonProcsTest, IndexedSearchFindsWhatAPlainSearchFinds) {
+TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   std::mt19937 random(7);
   const std::u16string_view pieces[] = {u"<A>", u"</A>", u"<B>",  u"</B>", u"<A", u">",
                                         u"x",   u"<",    u"<A><", u"<B/>", u"AB", u"\r\n"};
@@ -89,18 +89,41 @@ TEST(basCommonProcsTest, IndexedSearchFindsWhatAPlainSearchFinds) {
   for (int round = 0; round < 2000; ++round) {
     const size_t from = random() % (text.size() + 10);
     for (const TextView pattern : {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"),
-                                   TextView(u"<C>"), TextView(u"A><")}) {
+                                   TextView(u"<C>"), TextView(u"A><"), TextView(u"<")}) {
       ASSERT_EQ(internal::findForward(text, pattern, from), text.find(pattern, from))
           << round << " " << toUtf8(Text(pattern));
     }
   }
-  // A tag the index points at that is no longer there sends the search back to the text.
-  const size_t first = text.find(u"<A>");
-  text.replace(first, 3, u"<C>");
-  EXPECT_EQ(internal::findForward(text, u"<A>", first), text.find(u"<A>", first));
-  // Another text is indexed on its own.
-  const Text other = text + u"<D>";
-  EXPECT_EQ(internal::findForward(other, u"<D>", 0), other.size() - 3);
+  // Matches at every offset near the end, where the wide comparison hands over.
+  for (size_t size = 2; size < 40; ++size) {
+    const Text tail = Text(size - 2, u'x') + u"<A";
+    for (size_t from = 0; from <= size; ++from) {
+      ASSERT_EQ(internal::findForward(tail, u"<A", from), tail.find(u"<A", from)) << size;
+    }
+  }
+}
+
+// A response assigned into the string that held the last one keeps its buffer and, here, its
+// length and both ends: the second read must see the second text.
+TEST(basCommonProcsTest, EachSearchSeesTheTextAsItIsNow) {
+  const Text padding(40000, u' ');
+  const Text first = u"<Phone>1</Phone>" + padding + u"<Mobile>x</Mobile>" + padding;
+  const Text second = u"<Phone>1</Phone>" + padding + u"<Pager>yyy</Pager>" + padding;
+  ASSERT_EQ(first.size(), second.size());
+  Text text = first;
+  int32_t start = 0;
+  int32_t end = 1;
+  EXPECT_EQ(getElementValue(text, u"Mobile", start, end, false, u""), u"x");
+  text = second;  // same buffer, same length, same ends
+  end = 1;
+  EXPECT_EQ(getElementValue(text, u"Pager", start, end, false, u""), u"yyy");
+  end = 1;
+  EXPECT_EQ(getElementValue(text, u"Mobile", start, end, false, u""), u"");
+  text[20] = u'<';  // changed in place
+  text.replace(21, 6, u"Fax>2<");
+  text.replace(27, 6, u"/Fax> ");
+  end = 1;
+  EXPECT_EQ(getElementValue(text, u"Fax", start, end, true, u""), u"2");
 }
 
 }  // namespace
