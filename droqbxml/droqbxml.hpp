@@ -1,10 +1,15 @@
-// DroQbXml: the umbrella header a host includes. Inside the library, include the headers
+// DroQbXml: the umbrella header a host includes. It declares every public class: the
+// facade, the builder, the connection wrapper, the value checks, the error object, trace
+// output, every record, reference and collection. Inside the library, include the headers
 // a file really uses instead.
 #ifndef DROQBXML_DROQBXML_HPP_
 #define DROQBXML_DROQBXML_HPP_
 
 #include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/component/DroXmlProcessor.hpp"
 #include "droqbxml/component/basGlobals.hpp"
+#include "droqbxml/connection/DroXmlSdkWrapper.hpp"
+#include "droqbxml/connection/RequestProcessor.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/diagnostics/Logs.hpp"
 #include "droqbxml/diagnostics/clsAppPathAccess.hpp"
@@ -14,8 +19,29 @@
 #include "droqbxml/qbxml/DroXmlElement.hpp"
 #include "droqbxml/qbxml/Enumerations.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
+#include "droqbxml/qbxml/basValidations.hpp"
+#include "droqbxml/qbxml/basValidationsModule.hpp"
 #include "droqbxml/qbxml/clsXmlStringEscaping.hpp"
+#include "droqbxml/records/DroAccount.hpp"
+#include "droqbxml/records/DroAccountCol.hpp"
+#include "droqbxml/records/DroAddress.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/records/DroCustomerCol.hpp"
+#include "droqbxml/records/DroItemDiscount.hpp"
+#include "droqbxml/records/DroItemGroup.hpp"
+#include "droqbxml/records/DroItemInventory.hpp"
+#include "droqbxml/records/DroItemPayment.hpp"
+#include "droqbxml/records/DroItemPayrollItemWage.hpp"
+#include "droqbxml/records/DroItemSalesTax.hpp"
+#include "droqbxml/records/DroItemSubtotal.hpp"
+#include "droqbxml/records/DroItemsCol.hpp"
+#include "droqbxml/records/DroObjRef.hpp"
+#include "droqbxml/records/DroSalesItems.hpp"
+#include "droqbxml/records/DroSalesOrPurchase.hpp"
+#include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/basCommonProcs.hpp"
 #include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/Enumerator.hpp"
 #include "droqbxml/runtime/KeyedCollection.hpp"
 #include "droqbxml/runtime/Object.hpp"
 #include "droqbxml/runtime/Text.hpp"

@@ -14,10 +14,22 @@
 #include "droqbxml/qbxml/DroXmlElement.hpp"
 #include "droqbxml/qbxml/basValidationsModule.hpp"
 #include "droqbxml/qbxml/clsXmlStringEscaping.hpp"
+#include "droqbxml/records/DroAccount.hpp"
+#include "droqbxml/records/DroAccountCol.hpp"
 #include "droqbxml/records/DroAddress.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
+#include "droqbxml/records/DroItemDiscount.hpp"
+#include "droqbxml/records/DroItemGroup.hpp"
+#include "droqbxml/records/DroItemInventory.hpp"
+#include "droqbxml/records/DroItemPayment.hpp"
+#include "droqbxml/records/DroItemPayrollItemWage.hpp"
+#include "droqbxml/records/DroItemSalesTax.hpp"
+#include "droqbxml/records/DroItemSubtotal.hpp"
+#include "droqbxml/records/DroItemsCol.hpp"
 #include "droqbxml/records/DroObjRef.hpp"
+#include "droqbxml/records/DroSalesItems.hpp"
+#include "droqbxml/records/DroSalesOrPurchase.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -36,7 +48,7 @@ Ref<Object> make() {
   return std::make_shared<T>();
 }
 
-constexpr std::array<CreatableClass, 14> kClasses{{
+constexpr std::array<CreatableClass, 33> kClasses{{
     {u"DroXmlProcessor", &make<DroXmlProcessor>},
     {u"clsMyErr", &make<clsMyErr>},
     {u"clsAppPathAccess", &make<clsAppPathAccess>},
@@ -51,6 +63,25 @@ constexpr std::array<CreatableClass, 14> kClasses{{
     {u"DroAddress", &make<DroAddress>},
     {u"DroCustomer", &make<DroCustomer>},
     {u"DroCustomerCol", &make<DroCustomerCol>},
+    {u"DroAccount", &make<DroAccount>},
+    {u"DroAccountCol", &make<DroAccountCol>},
+    {u"DroItemNonInventory", &make<DroItemNonInventory>},
+    {u"DroItemSubtotal", &make<DroItemSubtotal>},
+    {u"DroItemInventory", &make<DroItemInventory>},
+    {u"DroItemDiscount", &make<DroItemDiscount>},
+    {u"DroItemGroup", &make<DroItemGroup>},
+    {u"DroItemOtherCharge", &make<DroItemOtherCharge>},
+    {u"DroItemPayment", &make<DroItemPayment>},
+    {u"DroItemSalesTax", &make<DroItemSalesTax>},
+    {u"DroItemSalesTaxGroup", &make<DroItemSalesTaxGroup>},
+    {u"DroItemService", &make<DroItemService>},
+    {u"DroItemPayrollItemWage", &make<DroItemPayrollItemWage>},
+    {u"DroSalesOrPurchase", &make<DroSalesOrPurchase>},
+    {u"DroSalesAndPurchase", &make<DroSalesAndPurchase>},
+    {u"DroItemGroupLine", &make<DroItemGroupLine>},
+    {u"DroItemGroupLineCol", &make<DroItemGroupLineCol>},
+    {u"DroPaymentMethod", &make<DroPaymentMethod>},
+    {u"DroItemsCol", &make<DroItemsCol>},
 }};
 
 }  // namespace

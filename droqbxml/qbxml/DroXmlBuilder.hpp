@@ -17,6 +17,7 @@
 
 namespace droqbxml {
 
+class DroAccount;
 class DroCustomer;
 class DroCustomerCol;
 
@@ -105,6 +106,17 @@ class DroXmlBuilder final : public Object {
   // RequestID becomes the request's identifier.
   void BuildAddCustomer(const Ref<DroCustomer>& cust);
   void BuildAddJob(const Ref<DroCustomer>& Job);
+  // The request adding one account: "Name" and "AccountType" always (empty ones too), the
+  // parent reference ("ListID" preferred) and the other texts the host set. Nothing else
+  // the account holds is sent. The account's RequestID becomes the request's identifier.
+  void BuildAddAccount(const Ref<DroAccount>& Account);
+  // The request adding one item of the kind ItemType. The non-inventory builder takes a
+  // DroItemNonInventory (any other object is the runtime's 13 before anything is written);
+  // every other kind reaches the item's members by name, so any object with members of
+  // those names will do, and a member it lacks is the runtime's 438 where it is used,
+  // leaving the document incomplete. Payroll wage, udUnknown and any other value build
+  // nothing and leave XML as it was.
+  void BuildAddItem(udItemType ItemType, const Variant& Item);
 
   // True when the first "requestID=" of the response carries ReqID (any id when ReqID is
   // empty) and the first "statusCode=" after it is "0". A status code without a closing

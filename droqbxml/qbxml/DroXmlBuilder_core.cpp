@@ -10,6 +10,7 @@
 
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
+#include "droqbxml/records/DroAccount.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
 #include "droqbxml/runtime/Binding.hpp"
@@ -76,6 +77,8 @@ const ClassInfo& DroXmlBuilder::typeInfo() {
                 static_cast<void (B::*)(const Ref<DroCustomerCol>&)>(&B::BuildRetCustomerInfo))
         .method(u"BuildAddCustomer", &B::BuildAddCustomer)
         .method(u"BuildAddJob", &B::BuildAddJob)
+        .method(u"BuildAddAccount", &B::BuildAddAccount)
+        .method(u"BuildAddItem", &B::BuildAddItem)
         .method(u"BuildQueryByAll", &B::BuildQueryByAll)
         .method(u"BuildQueryByFullName", &B::BuildQueryByFullName)
         .method(u"BuildQueryByListID", &B::BuildQueryByListID)

@@ -22,13 +22,16 @@ using internal::writeReferenceIfSet;
 // condition is tested.
 template <class ParentTest>
 void writeCustomerAdd(DroXmlBuilder& builder, DroCustomer& cust, ParentTest writesParent) {
-  cust.RequestID(internal::openAddRequest(builder, u"CustomerAddRq"));
+  internal::openAddRequest(builder, u"CustomerAddRq", [&](const Text& id) {
+    cust.RequestID(id);
+    return cust.RequestID();
+  });
   builder.AddAggregateBegin(builder.CreateElement(u"CustomerAdd"));
   writeElement(builder, u"Name", cust.Name());  // always, even when empty
   writeElementIfSet(builder, u"IsActive", cust.IsActive());
   const DroParentRef& parent = *cust.ParentRef();
   if (writesParent(parent))
-    writeReference(builder, u"ParentRef", parent.ListID(), parent.FullName());
+    writeReference(builder, u"ParentRef", parent);
   writeElementIfSet(builder, u"CompanyName", cust.CompanyName());
   writeElementIfSet(builder, u"Salutation", cust.Salutation());
   writeElementIfSet(builder, u"FirstName", cust.FirstName());

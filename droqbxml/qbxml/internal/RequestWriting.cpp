@@ -3,6 +3,8 @@
 
 #include <string>
 
+#include "droqbxml/runtime/ComError.hpp"
+
 namespace droqbxml::internal {
 
 void writeElement(DroXmlBuilder& builder, TextView name, const Text& value) {
@@ -11,17 +13,6 @@ void writeElement(DroXmlBuilder& builder, TextView name, const Text& value) {
 
 void writeElementIfSet(DroXmlBuilder& builder, TextView name, const Text& value) {
   if (!value.empty()) writeElement(builder, name, value);
-}
-
-void writeReference(DroXmlBuilder& builder, TextView name, const Text& listId,
-                    const Text& fullName) {
-  builder.AddAggregateBegin(builder.CreateElement(Text(name)));
-  if (!listId.empty()) {
-    writeElement(builder, u"ListID", listId);
-  } else {
-    writeElement(builder, u"FullName", fullName);
-  }
-  builder.AddAggregateEnd();
 }
 
 void writeAddressIfSet(DroXmlBuilder& builder, TextView name, const DroAddress& address) {
@@ -37,15 +28,29 @@ void writeAddressIfSet(DroXmlBuilder& builder, TextView name, const DroAddress& 
   builder.AddAggregateEnd();
 }
 
-Text openAddRequest(DroXmlBuilder& builder, TextView requestName) {
+void openAddRequest(DroXmlBuilder& builder, TextView requestName,
+                    const std::function<Text(const Text&)>& exchange) {
   builder.Initialize();
   builder.AddHeaders();
   auto request = builder.CreateElement(Text(requestName));
   builder.RequestIDUp();
-  const Text id = asciiText(std::to_string(builder.RequestID()));
-  request->AttributeAdd(u"requestID", builder.XmlEscapeX(id));
+  const Text held = exchange(asciiText(std::to_string(builder.RequestID())));
+  request->AttributeAdd(u"requestID", builder.XmlEscapeX(held));
   builder.AddAggregateBegin(request);
-  return id;
+}
+
+void ByName::forEach(const std::function<void(const Variant&)>& body) const {
+  const auto members = self().call(u"NewEnum").toObject();
+  if (!members) raiseRuntimeError(RuntimeError::kObjectNotSet);
+  for (Variant member = members->call(u"Next"); !member.isEmpty();
+       member = members->call(u"Next")) {
+    body(member);
+  }
+}
+
+Object& ByName::self() const {
+  if (!object_) raiseRuntimeError(RuntimeError::kObjectNotSet);
+  return *object_;
 }
 
 }  // namespace droqbxml::internal

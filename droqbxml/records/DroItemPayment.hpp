@@ -1,0 +1,56 @@
+// DroItemPayment: a payment item (where the money goes and how it is paid), and
+// DroPaymentMethod, the plain list record of a payment method.
+#ifndef DROQBXML_RECORDS_DROITEMPAYMENT_HPP_
+#define DROQBXML_RECORDS_DROITEMPAYMENT_HPP_
+
+#include <array>
+#include <cstdint>
+
+#include "droqbxml/records/DroItemSubtotal.hpp"
+#include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/ListRecord.hpp"
+
+namespace droqbxml {
+
+class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
+ public:
+  static constexpr auto kFields = kShortItemFields;
+
+  DroItemPayment() : ItemRecordOf(udItemPayment) {}
+  static const ClassInfo& typeInfo();
+  const ClassInfo& classInfo() const override { return typeInfo(); }
+
+  const ObjectProperty<DroAccountRef>& DepositToAccountRef() const { return depositToAccountRef_; }
+  void DepositToAccountRef(Ref<DroAccountRef> v) { depositToAccountRef_ = std::move(v); }
+  const ObjectProperty<DroPaymentMethodRef>& PaymentMethodRef() const { return paymentMethodRef_; }
+  void PaymentMethodRef(Ref<DroPaymentMethodRef> v) { paymentMethodRef_ = std::move(v); }
+
+  // As DroAccount::ParseRs, for "<ItemPaymentRet>".
+  int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  Text PrintOut() const;
+
+ private:
+  ObjectProperty<DroAccountRef> depositToAccountRef_;
+  ObjectProperty<DroPaymentMethodRef> paymentMethodRef_;
+};
+
+// Header fields only; no parse and no dump.
+class DroPaymentMethod final : public ListRecordOf<DroPaymentMethod> {
+ public:
+  static constexpr std::array<FieldSpec, 7> kFields{{
+      listfields::kRequestID,
+      listfields::kListID,
+      listfields::kTimeCreated,
+      listfields::kTimeModified,
+      listfields::kEditSequence,
+      listfields::kName,
+      listfields::kIsActive,
+  }};
+
+  static const ClassInfo& typeInfo();
+  const ClassInfo& classInfo() const override { return typeInfo(); }
+};
+
+}  // namespace droqbxml
+
+#endif  // DROQBXML_RECORDS_DROITEMPAYMENT_HPP_

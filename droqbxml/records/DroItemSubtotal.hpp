@@ -1,0 +1,39 @@
+// DroItemSubtotal: a subtotal line item (a name and a description).
+#ifndef DROQBXML_RECORDS_DROITEMSUBTOTAL_HPP_
+#define DROQBXML_RECORDS_DROITEMSUBTOTAL_HPP_
+
+#include <array>
+#include <cstdint>
+
+#include "droqbxml/records/ListRecord.hpp"
+
+namespace droqbxml {
+
+// The rows of the item kinds without FullName and Sublevel: the header and a description.
+inline constexpr std::array<FieldSpec, 8> kShortItemFields{{
+    listfields::kRequestID,
+    listfields::kListID,
+    listfields::kTimeCreated,
+    listfields::kTimeModified,
+    listfields::kEditSequence,
+    listfields::kName,
+    listfields::kIsActive,
+    listfields::kItemDesc,
+}};
+
+class DroItemSubtotal final : public ItemRecordOf<DroItemSubtotal> {
+ public:
+  static constexpr auto kFields = kShortItemFields;
+
+  DroItemSubtotal() : ItemRecordOf(udItemSubtotal) {}
+  static const ClassInfo& typeInfo();
+  const ClassInfo& classInfo() const override { return typeInfo(); }
+
+  // As DroAccount::ParseRs, for "<ItemSubtotalRet>".
+  int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  Text PrintOut() const;
+};
+
+}  // namespace droqbxml
+
+#endif  // DROQBXML_RECORDS_DROITEMSUBTOTAL_HPP_
