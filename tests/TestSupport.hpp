@@ -104,6 +104,26 @@ inline void writeFile(const std::filesystem::path& path, const std::string& byte
   out << bytes;
 }
 
+// Compares a text with the golden file tests/testdata/<name> (UTF-8, bytes exact: CR LF and
+// TABs included). With DROQBXML_WRITE_GOLDENS=1 it writes the file instead and fails, so a
+// new or changed golden is read by a person before it is committed.
+inline ::testing::AssertionResult matchesGolden(const Text& text, const std::string& name) {
+  const std::filesystem::path path = std::filesystem::path(DROQBXML_TESTDATA_DIR) / name;
+  if (const char* write = std::getenv("DROQBXML_WRITE_GOLDENS"); write && *write == '1') {
+    writeFile(path, toUtf8(text));
+    return ::testing::AssertionFailure() << "wrote " << path;
+  }
+  if (!std::filesystem::exists(path)) return ::testing::AssertionFailure() << "no " << path;
+  const std::string expected = readFile(path);
+  if (expected == toUtf8(text)) return ::testing::AssertionSuccess();
+  return ::testing::AssertionFailure() << "differs from " << path << ":\n" << toUtf8(text);
+}
+
+// A response file of ../shared/qbxml/responses, or "" when the shared folder is absent.
+inline Text sharedResponse(const std::string& name) {
+  return fromUtf8(readFile(std::string(DROQBXML_SHARED_DIR) + "/qbxml/responses/" + name));
+}
+
 }  // namespace test
 }  // namespace droqbxml
 
