@@ -30,8 +30,7 @@ void writeCustomerAdd(DroXmlBuilder& builder, DroCustomer& cust, ParentTest writ
   writeElement(builder, u"Name", cust.Name());  // always, even when empty
   writeElementIfSet(builder, u"IsActive", cust.IsActive());
   const DroParentRef& parent = *cust.ParentRef();
-  if (writesParent(parent))
-    writeReference(builder, u"ParentRef", parent);
+  if (writesParent(parent)) writeReference(builder, u"ParentRef", parent);
   writeElementIfSet(builder, u"CompanyName", cust.CompanyName());
   writeElementIfSet(builder, u"Salutation", cust.Salutation());
   writeElementIfSet(builder, u"FirstName", cust.FirstName());

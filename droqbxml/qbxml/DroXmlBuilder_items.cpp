@@ -102,9 +102,8 @@ void buildNonInventory(DroXmlBuilder& builder, DroItemNonInventory& item) {
   writeReferenceIfSet(builder, u"ParentRef", *item.ParentRef());
   writeReferenceIfSet(builder, u"SalesTaxCodeRef", *item.SalesTaxCodeRef());
   const DroSalesOrPurchase& side = *item.SalesOrPurchase();
-  const bool set = !side.Desc().empty() || !side.Price().empty() ||
-                   !side.PricePercent().empty() || !side.AccountRef()->ListID().empty() ||
-                   !side.AccountRef()->FullName().empty();
+  const bool set = !side.Desc().empty() || !side.Price().empty() || !side.PricePercent().empty() ||
+                   !side.AccountRef()->ListID().empty() || !side.AccountRef()->FullName().empty();
   writeSalesSide(builder, named, set, false);
   closeItemAdd(builder);
 }

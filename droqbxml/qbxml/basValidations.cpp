@@ -210,7 +210,7 @@ Text CheckDATETYPE(const Text& value) {
 Text CheckDATETIMETYPE(const Text& value) { return value; }
 
 Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
-                 const int32_t& lower) {
+                  const int32_t& lower) {
   if (value.empty()) return {};
   const int32_t number = textToLong(value);
   const bool refused = (mode == kIntLengthMode && static_cast<int64_t>(value.size()) > upper) ||

@@ -52,7 +52,7 @@ Text CheckDATETIMETYPE(const Text& value);
 // `upper` characters, mode 2 a number outside `lower` .. `upper`; other modes check nothing
 // more. TYPE_INT.
 Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
-                 const int32_t& lower);
+                  const int32_t& lower);
 
 // A price: converted to currency (four decimals kept, half to even; 13 for non-numeric
 // text, 6 beyond the currency range), at most 10 digits before the decimal point, a

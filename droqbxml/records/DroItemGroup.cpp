@@ -77,13 +77,12 @@ const ClassInfo& DroItemGroup::typeInfo() {
 }
 
 int32_t DroItemGroup::ParseRs(const Text& Value, const int32_t& StartPoint) {
-  return parseList(Value, StartPoint, u"<ItemGroupRet>",
-                   [&](Reader& read, int32_t& s, int32_t& e) {
-                     readHeader(read);
-                     read.required<u"IsActive">();
-                     read.optional<u"ItemDesc", u"IsPrintItemsInGroup">();
-                     itemGroupLines_->ParseRs(Value, s, e);
-                   });
+  return parseList(Value, StartPoint, u"<ItemGroupRet>", [&](Reader& read, int32_t& s, int32_t& e) {
+    readHeader(read);
+    read.required<u"IsActive">();
+    read.optional<u"ItemDesc", u"IsPrintItemsInGroup">();
+    itemGroupLines_->ParseRs(Value, s, e);
+  });
 }
 
 Text DroItemGroup::PrintOut() const {

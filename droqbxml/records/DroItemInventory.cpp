@@ -52,8 +52,8 @@ Text DroItemInventory::PrintOut() const {
   dump.block(u"COGSACCOUNTREF:", cogsAccountRef_->PrintOut(), u"/COGSACCOUNTREF");
   dump.block(u"PREFVENDORREF:", prefVendorRef_->PrintOut(), u"/PREFVENDORREF");
   dump.block(u"ASSETACCOUNTREF:", assetAccountRef_->PrintOut(), u"/ASSETACCOUNTREF");
-  dump.fields<u"ReorderPoint", u"QuantityOnHand", u"AverageCost", u"QuantityOnOrder",
-              u"TotalValue", u"InventoryDate">(*this);
+  dump.fields<u"ReorderPoint", u"QuantityOnHand", u"AverageCost", u"QuantityOnOrder", u"TotalValue",
+              u"InventoryDate">(*this);
   return dump.take();
 }
 

@@ -22,21 +22,22 @@ const ClassInfo& DroSalesItem<Kind>::typeInfo() {
 template <SalesItemKind Kind>
 int32_t DroSalesItem<Kind>::ParseRs(const Text& Value, int32_t StartPoint) {
   using Reader = typename DroSalesItem::Reader;
-  return this->parseList(
-      Value, StartPoint, kSpec.returnTag, [&](Reader& read, int32_t& s, int32_t& e) {
-        this->readHeader(read);
-        read.template required<u"IsActive">();
-        parentRef_->ParseRs(u"ParentRef", Value, s, e);
-        if constexpr (kSpec.sublevelRequired) {
-          read.template required<u"Sublevel">();
-        } else {
-          read.template optional<u"Sublevel">();
-        }
-        salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, s, e);
-        const Text parent(kSpec.returnTag);
-        salesOrPurchase_->ParseRs(u"SalesOrPurchase", Value, s, e, parent);
-        if (s == 0) salesAndPurchase_->ParseRs(u"SalesAndPurchase", Value, s, e, parent);
-      });
+  return this->parseList(Value, StartPoint, kSpec.returnTag,
+                         [&](Reader& read, int32_t& s, int32_t& e) {
+                           this->readHeader(read);
+                           read.template required<u"IsActive">();
+                           parentRef_->ParseRs(u"ParentRef", Value, s, e);
+                           if constexpr (kSpec.sublevelRequired) {
+                             read.template required<u"Sublevel">();
+                           } else {
+                             read.template optional<u"Sublevel">();
+                           }
+                           salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, s, e);
+                           const Text parent(kSpec.returnTag);
+                           salesOrPurchase_->ParseRs(u"SalesOrPurchase", Value, s, e, parent);
+                           if (s == 0)
+                             salesAndPurchase_->ParseRs(u"SalesAndPurchase", Value, s, e, parent);
+                         });
 }
 
 template <SalesItemKind Kind>

@@ -34,8 +34,8 @@ void DroSalesOrPurchase::ParseRs(const Text&, const Text& Value, int32_t& StartP
   // never does: a response's percentage is not read. "PricePrecent" is spelt as it always
   // was.
   if (StartPoint == 0) {
-    PricePercent(basCommonProcs::getElementValue(Value, u"PricePrecent", StartPoint, EndPoint,
-                                                 true, path));
+    PricePercent(
+        basCommonProcs::getElementValue(Value, u"PricePrecent", StartPoint, EndPoint, true, path));
   }
   accountRef_->ParseRs(u"AccountRef", Value, StartPoint, EndPoint, true, path);
 }

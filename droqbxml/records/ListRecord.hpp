@@ -59,34 +59,22 @@ class ListRecordOf : public RecordOf<Derived> {
   void Name(const Text& v) { this->template setField<u"Name">(v); }
   const Text& IsActive() const { return this->template field<u"IsActive">(); }
   void IsActive(const Text& v) { this->template setField<u"IsActive">(v); }
-  const Text& FullName() const
-    requires(has(u"FullName"))
-  {
+  const Text& FullName() const requires(has(u"FullName")) {
     return this->template field<u"FullName">();
   }
-  void FullName(const Text& v)
-    requires(has(u"FullName"))
-  {
+  void FullName(const Text& v) requires(has(u"FullName")) {
     this->template setField<u"FullName">(v);
   }
-  const Text& Sublevel() const
-    requires(has(u"Sublevel"))
-  {
+  const Text& Sublevel() const requires(has(u"Sublevel")) {
     return this->template field<u"Sublevel">();
   }
-  void Sublevel(const Text& v)
-    requires(has(u"Sublevel"))
-  {
+  void Sublevel(const Text& v) requires(has(u"Sublevel")) {
     this->template setField<u"Sublevel">(v);
   }
-  const Text& ItemDesc() const
-    requires(has(u"ItemDesc"))
-  {
+  const Text& ItemDesc() const requires(has(u"ItemDesc")) {
     return this->template field<u"ItemDesc">();
   }
-  void ItemDesc(const Text& v)
-    requires(has(u"ItemDesc"))
-  {
+  void ItemDesc(const Text& v) requires(has(u"ItemDesc")) {
     this->template setField<u"ItemDesc">(v);
   }
 
@@ -109,8 +97,7 @@ class ListRecordOf : public RecordOf<Derived> {
 
   // "ListID" through "Name", "FullName" where the record has it, each required.
   static void readHeader(Reader& read) {
-    read.template required<u"ListID", u"TimeCreated", u"TimeModified", u"EditSequence",
-                           u"Name">();
+    read.template required<u"ListID", u"TimeCreated", u"TimeModified", u"EditSequence", u"Name">();
     if constexpr (has(u"FullName")) read.template required<u"FullName">();
   }
 

@@ -235,10 +235,9 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  record_.setFieldValue(
-      index, basCommonProcs::getElementValue(value_, record_.fieldSpecs()[index].name, start_,
-                                             end_, isRequired,
-                                             isRequired ? TextView(parent_) : TextView()));
+  record_.setFieldValue(index, basCommonProcs::getElementValue(
+                                   value_, record_.fieldSpecs()[index].name, start_, end_,
+                                   isRequired, isRequired ? TextView(parent_) : TextView()));
 }
 
 }  // namespace droqbxml

@@ -1,9 +1,8 @@
 // A host that includes the umbrella header and nothing else of the library: every public
 // class is there, and the calls a C++ host writes naturally compile as written.
-#include "droqbxml/droqbxml.hpp"
-
 #include <gtest/gtest.h>
 
+#include "droqbxml/droqbxml.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace {

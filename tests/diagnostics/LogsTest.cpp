@@ -1,9 +1,8 @@
 // The error log and the failed-exchange log, byte for byte.
-#include "droqbxml/diagnostics/Logs.hpp"
-
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/basGlobals.hpp"
+#include "droqbxml/diagnostics/Logs.hpp"
 #include "droqbxml/diagnostics/clsAppPathAccess.hpp"
 #include "droqbxml/diagnostics/clsMyErr.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
@@ -36,8 +35,7 @@ TEST_F(LogsTest, ErrorLogUsesTheDefaultPathWhenNoneIsSet) {
   err.SetErrorInfo(DRO_XML_PROCESSOR_IMPROPERLY_INITIONALIZED, u"DroXmlProcessor.AddHeaders",
                    u"not initialised");
   err.LogError();
-  EXPECT_EQ(readFile(drive_.path("Program Files/Orvanne/Tessaly/Logs/ErrorLog.txt")),
-            kFirstRecord);
+  EXPECT_EQ(readFile(drive_.path("Program Files/Orvanne/Tessaly/Logs/ErrorLog.txt")), kFirstRecord);
   EXPECT_EQ(basGlobals::DroPathAccess(), u"");  // the default served this call only
 }
 

@@ -1,10 +1,9 @@
 // The error object: storing, carrying over and raising errors, by type and by name.
-#include "droqbxml/diagnostics/clsMyErr.hpp"
-
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/component/basGlobals.hpp"
+#include "droqbxml/diagnostics/clsMyErr.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -25,11 +24,13 @@ ErrorRecord sampleRecord() {
 
 TEST(clsMyErrTest, RaiseStoresTheGivenValuesOverThePreviousOnes) {
   clsMyErr err;
-  EXPECT_TRUE(raises([&] { err.Raise(Variant::missing(), TYPE_DATE, u"A.B", u"bad", u"first.chm", u"7"); },
-                     TYPE_DATE, u"A.B", u"bad"));
+  EXPECT_TRUE(
+      raises([&] { err.Raise(Variant::missing(), TYPE_DATE, u"A.B", u"bad", u"first.chm", u"7"); },
+             TYPE_DATE, u"A.B", u"bad"));
   // Left-out values keep the previous error's.
-  EXPECT_TRUE(raises([&] { err.Raise(Variant::missing(), TYPE_BOOL, Variant::missing(), u"worse"); },
-                     TYPE_BOOL, u"A.B", u"worse"));
+  EXPECT_TRUE(
+      raises([&] { err.Raise(Variant::missing(), TYPE_BOOL, Variant::missing(), u"worse"); },
+             TYPE_BOOL, u"A.B", u"worse"));
   EXPECT_EQ(err.HelpFile(), u"first.chm");
   EXPECT_EQ(err.HelpContext(), u"7");
   // Number 0 stores and returns without raising.
@@ -66,15 +67,16 @@ TEST(clsMyErrTest, SetErrorAndSetErrorInfoStartFromCleared) {
   EXPECT_EQ(err.Description(), u"File not found");
   EXPECT_EQ(err.HelpFile(), u"help.chm");
   EXPECT_EQ(err.HelpContext(), u"1234");
-  EXPECT_TRUE(raises([&] { err.Raise(); }, 53, u"DroXmlSdkWrapper.SessionBegin", u"File not found"));
+  EXPECT_TRUE(
+      raises([&] { err.Raise(); }, 53, u"DroXmlSdkWrapper.SessionBegin", u"File not found"));
   err.Clear();
   EXPECT_EQ(err.record().Number, 0);
   EXPECT_EQ(err.HelpFile(), u"");
 }
 
 TEST(clsMyErrTest, ComponentErrorsGoThroughTheSharedObject) {
-  EXPECT_TRUE(raises([] { raiseComponentError(PARING, u"X.Y", u"parse"); }, PARING, u"X.Y",
-                     u"parse"));
+  EXPECT_TRUE(
+      raises([] { raiseComponentError(PARING, u"X.Y", u"parse"); }, PARING, u"X.Y", u"parse"));
   const auto shared = basGlobals::SharedErrorObject();
   EXPECT_EQ(shared->Number(), static_cast<int32_t>(0x80044E34));
   EXPECT_EQ(shared->Source(), u"X.Y");

@@ -170,8 +170,9 @@ TEST(ItemBuildersTest, WhatBuildsNothingOrStopsHalfway) {
   const auto group = std::make_shared<DroItemSalesTaxGroup>();
   group->Name(u"Both");
   group->ItemSalesTaxRefs()->Add(Variant(7));
-  EXPECT_TRUE(test::raisesRuntime([&] { builder.BuildAddItem(udItemSalesTaxGroup, Variant(group)); },
-                                  RuntimeError::kTypeMismatch));
+  EXPECT_TRUE(
+      test::raisesRuntime([&] { builder.BuildAddItem(udItemSalesTaxGroup, Variant(group)); },
+                          RuntimeError::kTypeMismatch));
   EXPECT_NE(builder.XML().find(u"<Name>Both</Name>"), Text::npos);
   EXPECT_EQ(builder.XML().find(u"</QBXML>"), Text::npos);
   // A host object without a member the builder reaches: 438 there, the document incomplete.

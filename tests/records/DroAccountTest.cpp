@@ -74,8 +74,8 @@ TEST(DroAccountTest, SetterLimits) {
                                   u"CheckSTRTYPE", Text(32, u'n'), u"STRTYPE"));
   account.Name(u" Petty cash ");  // not trimmed
   EXPECT_EQ(account.Name(), u" Petty cash ");
-  EXPECT_TRUE(test::raisesRefusal([&] { account.Sublevel(u"5"); }, TYPE_INT, u"CheckINTTYPE",
-                                  u"5", u"INTTYPE"));
+  EXPECT_TRUE(test::raisesRefusal([&] { account.Sublevel(u"5"); }, TYPE_INT, u"CheckINTTYPE", u"5",
+                                  u"INTTYPE"));
   EXPECT_TRUE(test::raisesRefusal([&] { account.EditSequence(u"00000000000000017"); }, TYPE_INT,
                                   u"CheckINTTYPE", u"00000000000000017", u"INTTYPE"));
   account.EditSequence(u"0000000000000017");

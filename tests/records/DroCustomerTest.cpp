@@ -5,8 +5,8 @@
 
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
-#include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/qbxml/DroXmlBuilder.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
 #include "tests/TestSupport.hpp"
 
@@ -248,8 +248,11 @@ TEST(DroCustomerTest, ObjectPropertySetToNothingIsAnErrorWhereItIsUsed) {
   };
   EXPECT_TRUE(unset([&] { customer->PrintOut(); }));
   EXPECT_TRUE(unset([&] { customer->ParseRs(queryResponse(u"2", customerRet(u"Lee"))); }));
-  EXPECT_TRUE(unset([&] { customer->ParseCustInfo(u"<CustomerRet><NonQbFileName>f"
-                                                  u"</NonQbFileName></CustomerRet>"); }));
+  EXPECT_TRUE(unset([&] {
+    customer->ParseCustInfo(
+        u"<CustomerRet><NonQbFileName>f"
+        u"</NonQbFileName></CustomerRet>");
+  }));
   DroXmlBuilder builder;
   EXPECT_TRUE(unset([&] { builder.BuildAddCustomer(customer); }));
   const auto col = std::make_shared<DroCustomerCol>();

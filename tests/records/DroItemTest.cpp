@@ -19,8 +19,9 @@ namespace droqbxml {
 namespace {
 
 Text header(bool fullName = true) {
-  return Text(u"<ListID>80-1</ListID><TimeCreated>t</TimeCreated><TimeModified>t</TimeModified>"
-              u"<EditSequence>5</EditSequence><Name>Tile</Name>") +
+  return Text(
+             u"<ListID>80-1</ListID><TimeCreated>t</TimeCreated><TimeModified>t</TimeModified>"
+             u"<EditSequence>5</EditSequence><Name>Tile</Name>") +
          (fullName ? u"<FullName>Tile</FullName>" : u"") + u"<IsActive>true</IsActive>";
 }
 Text rs(const Text& kind, const Text& body, const Text& id = u"2") {
@@ -50,10 +51,11 @@ TEST(DroItemTest, ReadsTheRealInventoryAddResponse) {
 TEST(DroItemTest, SalesSidesAreReadOneOrTheOther) {
   DroItemNonInventory item;
   item.SalesOrPurchase()->PricePercent(u"7.50");
-  const Text both = u"<SalesOrPurchase><Desc>Grout</Desc><Price>2.5</Price>"
-                    u"<PricePercent>9</PricePercent><AccountRef><FullName>Sales</FullName>"
-                    u"</AccountRef></SalesOrPurchase><SalesAndPurchase><SalesDesc>x</SalesDesc>"
-                    u"</SalesAndPurchase>";
+  const Text both =
+      u"<SalesOrPurchase><Desc>Grout</Desc><Price>2.5</Price>"
+      u"<PricePercent>9</PricePercent><AccountRef><FullName>Sales</FullName>"
+      u"</AccountRef></SalesOrPurchase><SalesAndPurchase><SalesDesc>x</SalesDesc>"
+      u"</SalesAndPurchase>";
   item.ParseRs(rs(u"ItemNonInventory", header() + u"<Sublevel>0</Sublevel>" + both));
   EXPECT_EQ(item.SalesOrPurchase()->Price(), u"2.50000");
   EXPECT_EQ(item.SalesOrPurchase()->PricePercent(), u"7.5");  // never read from a response
@@ -61,11 +63,11 @@ TEST(DroItemTest, SalesSidesAreReadOneOrTheOther) {
   EXPECT_TRUE(item.SalesAndPurchase()->IsEmpty());
 
   DroItemOtherCharge other;
-  other.ParseRs(rs(u"ItemOtherCharge",
-                   header() + u"<Sublevel>0</Sublevel><SalesAndPurchase><SalesDesc>Haul"
-                              u"</SalesDesc><IncomeAccountRef><ListID>4</ListID>"
-                              u"</IncomeAccountRef><PurchaseCost>3</PurchaseCost>"
-                              u"</SalesAndPurchase>"));
+  other.ParseRs(
+      rs(u"ItemOtherCharge", header() + u"<Sublevel>0</Sublevel><SalesAndPurchase><SalesDesc>Haul"
+                                        u"</SalesDesc><IncomeAccountRef><ListID>4</ListID>"
+                                        u"</IncomeAccountRef><PurchaseCost>3</PurchaseCost>"
+                                        u"</SalesAndPurchase>"));
   EXPECT_TRUE(other.SalesOrPurchase()->IsEmpty());
   EXPECT_EQ(other.SalesAndPurchase()->SalesDesc(), u"Haul");
   EXPECT_EQ(other.SalesAndPurchase()->PurchaseCost(), u"3.00000");
@@ -97,10 +99,12 @@ TEST(DroItemTest, SublevelIsRequiredButForServices) {
 }
 
 TEST(DroItemTest, GroupLinesKeepTheFirstOfLooseDuplicates) {
-  const Text line1 = u"<ItemGroupLine><ItemRef><ListID>A</ListID><FullName>Tile</FullName>"
-                     u"</ItemRef><Quantity>2</Quantity></ItemGroupLine>";
-  const Text line2 = u"<ItemGroupLine><ItemRef><ListID>B</ListID><FullName>Grout</FullName>"
-                     u"</ItemRef><Quantity>2</Quantity></ItemGroupLine>";
+  const Text line1 =
+      u"<ItemGroupLine><ItemRef><ListID>A</ListID><FullName>Tile</FullName>"
+      u"</ItemRef><Quantity>2</Quantity></ItemGroupLine>";
+  const Text line2 =
+      u"<ItemGroupLine><ItemRef><ListID>B</ListID><FullName>Grout</FullName>"
+      u"</ItemRef><Quantity>2</Quantity></ItemGroupLine>";
   const Text line3 = u"<ItemGroupLine><Quantity>4</Quantity></ItemGroupLine>";
   DroItemGroup group;
   int32_t start = 3;
@@ -122,9 +126,8 @@ TEST(DroItemTest, GroupLinesKeepTheFirstOfLooseDuplicates) {
 }
 
 TEST(DroItemTest, SalesTaxGroupMembersReadFromTheGroupsStart) {
-  const Text response =
-      rs(u"ItemSalesTaxGroup", header(false) + u"<ItemDesc>Both</ItemDesc>") +
-      rs(u"ItemSalesTax", header(false) + u"<TaxRate>7.50</TaxRate>", u"3");
+  const Text response = rs(u"ItemSalesTaxGroup", header(false) + u"<ItemDesc>Both</ItemDesc>") +
+                        rs(u"ItemSalesTax", header(false) + u"<TaxRate>7.50</TaxRate>", u"3");
   DroItemSalesTaxGroup group;
   const auto member = group.ItemSalesTaxRefs()->Add(Variant(u"ItemSalesTax"));
   group.ParseRs(response);
@@ -195,8 +198,8 @@ TEST(DroItemsColTest, AddsOnlySixKinds) {
     EXPECT_EQ(items.Add(kind), nullptr);
   }
   EXPECT_EQ(items.Count(), 3);
-  EXPECT_TRUE(test::raisesRuntime([&] { items.Add(Variant(0), u"t"); },
-                                  RuntimeError::kDuplicateKey));
+  EXPECT_TRUE(
+      test::raisesRuntime([&] { items.Add(Variant(0), u"t"); }, RuntimeError::kDuplicateKey));
   EXPECT_EQ(items.Count(), 3);
   EXPECT_EQ(items.Item(Variant(1)), tax);
   // The facade keeps a DroItemsCol as the shared collection, and nothing else.

@@ -24,7 +24,8 @@ size_t findPair(const char16_t* data, size_t at, size_t last, char16_t first, ch
   while (at + 8 <= last + 1) {
     const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at));
     const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at + 1));
-    const __m128i both = _mm_and_si128(_mm_cmpeq_epi16(a, wantFirst), _mm_cmpeq_epi16(b, wantSecond));
+    const __m128i both =
+        _mm_and_si128(_mm_cmpeq_epi16(a, wantFirst), _mm_cmpeq_epi16(b, wantSecond));
     const int mask = _mm_movemask_epi8(both);
     if (mask != 0) return at + static_cast<size_t>(__builtin_ctz(static_cast<unsigned>(mask))) / 2;
     at += 8;
