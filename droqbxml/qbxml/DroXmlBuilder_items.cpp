@@ -58,12 +58,7 @@ void writeSalesOrPurchase(DroXmlBuilder& builder, const ByName& side, bool servi
   const ByName account = side.object(u"AccountRef");
   if (serviceForm) {
     builder.AddElement(builder.CreateElement(u"AccountRef"));
-    const Text listId = account.ListID();
-    if (!listId.empty()) {
-      writeElement(builder, u"ListID", listId);
-    } else {
-      writeElement(builder, u"FullName", account.FullName());
-    }
+    internal::writeListIdOrFullName(builder, account);
     builder.AddAggregateEnd();
   } else {
     writeReference(builder, u"AccountRef", account);
@@ -168,12 +163,7 @@ void buildGroup(DroXmlBuilder& builder, const ByName& item) {
     const ByName ref = line.object(u"ItemRef");
     if (ref.IsEmpty()) return;
     builder.AddAggregateBegin(builder.CreateElement(u"ItemRef"));
-    const Text listId = ref.ListID();
-    if (!listId.empty()) {
-      writeElement(builder, u"ListID", listId);
-    } else {
-      writeElement(builder, u"FullName", ref.FullName());
-    }
+    internal::writeListIdOrFullName(builder, ref);
     writeElementIfSet(builder, u"Quantity", line.text(u"Quantity"));
     builder.AddAggregateEnd();
   });

@@ -12,20 +12,10 @@ namespace droqbxml {
 
 class DroItemDiscount final : public ItemRecordOf<DroItemDiscount> {
  public:
-  static constexpr std::array<FieldSpec, 12> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kFullName,
-      listfields::kIsActive,
-      listfields::kSublevel,
-      listfields::kItemDesc,
-      listfields::named(listfields::kPrice, u"DiscountRate"),
-      {u"DiscountRatePercent", Trim::Spaces, Check::Percent},
-  }};
+  static constexpr auto kFields =
+      listfields::joined(listfields::kLongHeader, listfields::kItemDesc,
+                         listfields::named(listfields::kPrice, u"DiscountRate"),
+                         FieldSpec{u"DiscountRatePercent", Trim::Spaces, Check::Percent});
 
   DroItemDiscount() : ItemRecordOf(udItemDiscount) {}
   static const ClassInfo& typeInfo();

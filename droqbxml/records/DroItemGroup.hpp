@@ -50,17 +50,9 @@ class DroItemGroupLineCol final : public RecordCol<DroItemGroupLine> {
 
 class DroItemGroup final : public ItemRecordOf<DroItemGroup> {
  public:
-  static constexpr std::array<FieldSpec, 9> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kIsActive,
-      listfields::kItemDesc,
-      {u"IsPrintItemsInGroup", Trim::Spaces, Check::Bool},
-  }};
+  static constexpr auto kFields =
+      listfields::joined(listfields::kShortHeader, listfields::kItemDesc,
+                         FieldSpec{u"IsPrintItemsInGroup", Trim::Spaces, Check::Bool});
 
   DroItemGroup() : ItemRecordOf(udItemGroup) {}
   static const ClassInfo& typeInfo();

@@ -11,20 +11,19 @@
 
 namespace droqbxml {
 
+// The long header, but for a name that is not trimmed: the inventory item's alone.
+inline constexpr auto kInventoryHeader = [] {
+  auto rows = listfields::kLongHeader;
+  for (auto& row : rows) {
+    if (row.name == u"Name") row.trim = Trim::None;
+  }
+  return rows;
+}();
+
 class DroItemInventory final : public ItemRecordOf<DroItemInventory> {
  public:
-  static constexpr std::array<FieldSpec, 19> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      // Not trimmed here, unlike every other kind's name.
-      {u"Name", Trim::None, Check::Str, 31},
-      listfields::kFullName,
-      listfields::kIsActive,
-      listfields::kSublevel,
-      listfields::named(listfields::kDescription, u"SalesDesc"),
+  static constexpr auto kFields = listfields::joined(
+      kInventoryHeader, listfields::named(listfields::kDescription, u"SalesDesc"),
       listfields::named(listfields::kPrice, u"SalesPrice"),
       listfields::named(listfields::kDescription, u"PurchaseDesc"),
       listfields::named(listfields::kPrice, u"PurchaseCost"),
@@ -32,9 +31,8 @@ class DroItemInventory final : public ItemRecordOf<DroItemInventory> {
       listfields::named(listfields::kQuantity, u"QuantityOnHand"),
       listfields::named(listfields::kPrice, u"AverageCost"),
       listfields::named(listfields::kQuantity, u"QuantityOnOrder"),
-      {u"TotalValue", Trim::Spaces, Check::Amt},
-      {u"InventoryDate", Trim::Spaces, Check::Date},
-  }};
+      FieldSpec{u"TotalValue", Trim::Spaces, Check::Amt},
+      FieldSpec{u"InventoryDate", Trim::Spaces, Check::Date});
 
   DroItemInventory() : ItemRecordOf(udItemInventory) {}
   static const ClassInfo& typeInfo();

@@ -37,15 +37,7 @@ class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
 // Header fields only; no parse and no dump.
 class DroPaymentMethod final : public ListRecordOf<DroPaymentMethod> {
  public:
-  static constexpr std::array<FieldSpec, 7> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kIsActive,
-  }};
+  static constexpr auto kFields = listfields::kShortHeader;
 
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }

@@ -12,16 +12,8 @@ namespace droqbxml {
 
 class DroItemPayrollItemWage final : public ItemRecordOf<DroItemPayrollItemWage> {
  public:
-  static constexpr std::array<FieldSpec, 8> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kIsActive,
-      {u"WageType", Trim::Spaces, Check::WageType},
-  }};
+  static constexpr auto kFields = listfields::joined(
+      listfields::kShortHeader, FieldSpec{u"WageType", Trim::Spaces, Check::WageType});
 
   DroItemPayrollItemWage() : ItemRecordOf(udItemPayrollItemWage) {}
   static const ClassInfo& typeInfo();

@@ -15,17 +15,9 @@ namespace droqbxml {
 
 class DroItemSalesTax final : public ItemRecordOf<DroItemSalesTax> {
  public:
-  static constexpr std::array<FieldSpec, 9> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kIsActive,
-      listfields::kItemDesc,
-      {u"TaxRate", Trim::Spaces, Check::Percent},
-  }};
+  static constexpr auto kFields =
+      listfields::joined(listfields::kShortHeader, listfields::kItemDesc,
+                         FieldSpec{u"TaxRate", Trim::Spaces, Check::Percent});
 
   DroItemSalesTax() : ItemRecordOf(udItemSalesTax) {}
   static const ClassInfo& typeInfo();

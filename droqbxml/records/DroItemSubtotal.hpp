@@ -10,16 +10,8 @@
 namespace droqbxml {
 
 // The rows of the item kinds without FullName and Sublevel: the header and a description.
-inline constexpr std::array<FieldSpec, 8> kShortItemFields{{
-    listfields::kRequestID,
-    listfields::kListID,
-    listfields::kTimeCreated,
-    listfields::kTimeModified,
-    listfields::kEditSequence,
-    listfields::kName,
-    listfields::kIsActive,
-    listfields::kItemDesc,
-}};
+inline constexpr auto kShortItemFields =
+    listfields::joined(listfields::kShortHeader, listfields::kItemDesc);
 
 class DroItemSubtotal final : public ItemRecordOf<DroItemSubtotal> {
  public:

@@ -36,17 +36,7 @@ template <SalesItemKind Kind>
 class DroSalesItem final : public ItemRecordOf<DroSalesItem<Kind>> {
  public:
   static constexpr const SalesItemSpec& kSpec = kSalesItemKinds[static_cast<size_t>(Kind)];
-  static constexpr std::array<FieldSpec, 9> kFields{{
-      listfields::kRequestID,
-      listfields::kListID,
-      listfields::kTimeCreated,
-      listfields::kTimeModified,
-      listfields::kEditSequence,
-      listfields::kName,
-      listfields::kFullName,
-      listfields::kIsActive,
-      listfields::kSublevel,
-  }};
+  static constexpr auto kFields = listfields::kLongHeader;
 
   DroSalesItem() : ItemRecordOf<DroSalesItem<Kind>>(kSpec.itemType) {}
   static const ClassInfo& typeInfo();

@@ -5,6 +5,8 @@
 #ifndef DROQBXML_RECORDS_LISTRECORD_HPP_
 #define DROQBXML_RECORDS_LISTRECORD_HPP_
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 
 #include "droqbxml/qbxml/Enumerations.hpp"
@@ -32,6 +34,28 @@ constexpr FieldSpec named(const FieldSpec& shape, std::u16string_view name) {
   FieldSpec row = shape;
   row.name = name;
   return row;
+}
+
+// The header every list record starts its table with, and the longer one of the kinds that
+// also have FullName and Sublevel.
+inline constexpr std::array<FieldSpec, 7> kShortHeader{
+    {kRequestID, kListID, kTimeCreated, kTimeModified, kEditSequence, kName, kIsActive}};
+inline constexpr std::array<FieldSpec, 9> kLongHeader{{kRequestID, kListID, kTimeCreated,
+                                                       kTimeModified, kEditSequence, kName,
+                                                       kFullName, kIsActive, kSublevel}};
+
+// A header followed by the record's own rows.
+template <size_t A, size_t B>
+constexpr std::array<FieldSpec, A + B> joined(const std::array<FieldSpec, A>& head,
+                                              const std::array<FieldSpec, B>& own) {
+  std::array<FieldSpec, A + B> rows{};
+  for (size_t i = 0; i < A; ++i) rows[i] = head[i];
+  for (size_t i = 0; i < B; ++i) rows[A + i] = own[i];
+  return rows;
+}
+template <size_t A, class... Rows>
+constexpr auto joined(const std::array<FieldSpec, A>& head, const Rows&... own) {
+  return joined(head, std::array<FieldSpec, sizeof...(Rows)>{own...});
 }
 }  // namespace listfields
 

@@ -22,14 +22,18 @@ void writeElementIfSet(DroXmlBuilder& builder, TextView name, const Text& value)
 // FullName is read only when it is written). Reference: anything with ListID() and
 // FullName().
 template <class Reference>
-void writeReference(DroXmlBuilder& builder, TextView name, const Reference& ref) {
-  builder.AddAggregateBegin(builder.CreateElement(Text(name)));
+void writeListIdOrFullName(DroXmlBuilder& builder, const Reference& ref) {
   const Text listId = ref.ListID();
   if (!listId.empty()) {
     writeElement(builder, u"ListID", listId);
   } else {
     writeElement(builder, u"FullName", ref.FullName());
   }
+}
+template <class Reference>
+void writeReference(DroXmlBuilder& builder, TextView name, const Reference& ref) {
+  builder.AddAggregateBegin(builder.CreateElement(Text(name)));
+  writeListIdOrFullName(builder, ref);
   builder.AddAggregateEnd();
 }
 template <class Reference>
