@@ -60,11 +60,10 @@ const ClassInfo& DroItemsCol::typeInfo() {
 Ref<Object> DroItemsCol::Add(const Variant& ItemType, const Text& skey) {
   const std::optional<int32_t> number =
       ItemType.isObject() || ItemType.isMissing() ? std::nullopt : kindNumber(ItemType);
-  const std::optional<Text> name = ItemType.kind() == Variant::Kind::String
-                                       ? std::optional<Text>(ItemType.toText())
-                                       : std::nullopt;
+  const bool byName = ItemType.kind() == Variant::Kind::String;
+  const Text name = byName ? ItemType.toText() : Text();
   for (const CreatableKind& kind : kCreatable) {
-    if ((number && *number == kind.number) || (name && *name == kind.name)) {
+    if ((number && *number == kind.number) || (byName && name == kind.name)) {
       Ref<Object> item = kind.create();
       append(item, skey);
       return item;
