@@ -1,4 +1,4 @@
-// The payment item and the payment method.
+// The payment item.
 #include "droqbxml/records/DroItemPayment.hpp"
 
 namespace droqbxml {
@@ -33,15 +33,6 @@ Text DroItemPayment::PrintOut() const {
   dump.block(u"DEPOSITTOACCOUNTREF:", depositToAccountRef_->PrintOut(), u"/DEPOSITTOACCOUNTREF");
   dump.block(u"PAYMENTMETHODREF:", paymentMethodRef_->PrintOut(), u"/PAYMENTMETHODREF");
   return dump.take();
-}
-
-const ClassInfo& DroPaymentMethod::typeInfo() {
-  static const ClassInfo info = [] {
-    Members members;
-    addFieldMembers(members, kFields);
-    return ClassInfo(u"DroPaymentMethod", members.take());
-  }();
-  return info;
 }
 
 }  // namespace droqbxml

@@ -1,12 +1,10 @@
-// DroItemPayment: a payment item (where the money goes and how it is paid), and
-// DroPaymentMethod, the plain list record of a payment method.
+// DroItemPayment: a payment item: where the money goes and how it is paid.
 #ifndef DROQBXML_RECORDS_DROITEMPAYMENT_HPP_
 #define DROQBXML_RECORDS_DROITEMPAYMENT_HPP_
 
 #include <array>
 #include <cstdint>
 
-#include "droqbxml/records/DroItemSubtotal.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
@@ -14,7 +12,7 @@ namespace droqbxml {
 
 class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
  public:
-  static constexpr auto kFields = kShortItemFields;
+  static constexpr auto kFields = listfields::kShortItemFields;
 
   DroItemPayment() : ItemRecordOf(udItemPayment) {}
   static const ClassInfo& typeInfo();
@@ -32,15 +30,6 @@ class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
  private:
   ObjectProperty<DroAccountRef> depositToAccountRef_;
   ObjectProperty<DroPaymentMethodRef> paymentMethodRef_;
-};
-
-// Header fields only; no parse and no dump.
-class DroPaymentMethod final : public ListRecordOf<DroPaymentMethod> {
- public:
-  static constexpr auto kFields = listfields::kShortHeader;
-
-  static const ClassInfo& typeInfo();
-  const ClassInfo& classInfo() const override { return typeInfo(); }
 };
 
 }  // namespace droqbxml

@@ -1,13 +1,10 @@
-// DroItemSalesTax: a sales tax item (its rate and the agency it is paid to), and
-// DroItemSalesTaxGroup: a group of them charged together.
+// DroItemSalesTax: a sales tax item: its rate and the agency it is paid to.
 #ifndef DROQBXML_RECORDS_DROITEMSALESTAX_HPP_
 #define DROQBXML_RECORDS_DROITEMSALESTAX_HPP_
 
 #include <array>
 #include <cstdint>
 
-#include "droqbxml/records/DroItemSubtotal.hpp"
-#include "droqbxml/records/DroItemsCol.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
@@ -34,29 +31,6 @@ class DroItemSalesTax final : public ItemRecordOf<DroItemSalesTax> {
 
  private:
   ObjectProperty<DroVendorRef> taxVendorRef_;
-};
-
-class DroItemSalesTaxGroup final : public ItemRecordOf<DroItemSalesTaxGroup> {
- public:
-  static constexpr auto kFields = kShortItemFields;
-
-  DroItemSalesTaxGroup() : ItemRecordOf(udItemSalesTaxGroup) {}
-  static const ClassInfo& typeInfo();
-  const ClassInfo& classInfo() const override { return typeInfo(); }
-
-  // The group's members. Parsing takes them as DroItemSalesTax records; the add request
-  // takes them as DroItemSalesTaxRef references.
-  const ObjectProperty<DroItemsCol>& ItemSalesTaxRefs() const { return itemSalesTaxRefs_; }
-  void ItemSalesTaxRefs(Ref<DroItemsCol> v) { itemSalesTaxRefs_ = std::move(v); }
-
-  // As DroAccount::ParseRs, for "<ItemSalesTaxGroupRet>"; then every member, in order, runs
-  // its own ParseRs on the same text from the group's start (a member of another class is
-  // the runtime's 13).
-  int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
-  Text PrintOut() const;
-
- private:
-  ObjectProperty<DroItemsCol> itemSalesTaxRefs_;
 };
 
 }  // namespace droqbxml

@@ -9,13 +9,9 @@
 
 namespace droqbxml {
 
-// The rows of the item kinds without FullName and Sublevel: the header and a description.
-inline constexpr auto kShortItemFields =
-    listfields::joined(listfields::kShortHeader, listfields::kItemDesc);
-
 class DroItemSubtotal final : public ItemRecordOf<DroItemSubtotal> {
  public:
-  static constexpr auto kFields = kShortItemFields;
+  static constexpr auto kFields = listfields::kShortItemFields;
 
   DroItemSubtotal() : ItemRecordOf(udItemSubtotal) {}
   static const ClassInfo& typeInfo();

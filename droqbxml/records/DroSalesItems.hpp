@@ -8,6 +8,7 @@
 #include <array>
 #include <cstdint>
 
+#include "droqbxml/records/DroSalesAndPurchase.hpp"
 #include "droqbxml/records/DroSalesOrPurchase.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/records/ListRecord.hpp"

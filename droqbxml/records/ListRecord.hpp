@@ -57,6 +57,8 @@ template <size_t A, class... Rows>
 constexpr auto joined(const std::array<FieldSpec, A>& head, const Rows&... own) {
   return joined(head, std::array<FieldSpec, sizeof...(Rows)>{own...});
 }
+// The rows of the item kinds that have a description but no FullName and Sublevel.
+inline constexpr auto kShortItemFields = joined(kShortHeader, kItemDesc);
 }  // namespace listfields
 
 template <class Derived>

@@ -13,6 +13,7 @@
 #include "droqbxml/records/DroItemInventory.hpp"
 #include "droqbxml/records/DroItemPayment.hpp"
 #include "droqbxml/records/DroItemSalesTax.hpp"
+#include "droqbxml/records/DroItemSalesTaxGroup.hpp"
 #include "droqbxml/records/DroItemSubtotal.hpp"
 #include "droqbxml/records/DroSalesItems.hpp"
 #include "droqbxml/runtime/Binding.hpp"

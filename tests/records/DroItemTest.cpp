@@ -11,6 +11,7 @@
 #include "droqbxml/records/DroItemInventory.hpp"
 #include "droqbxml/records/DroItemPayrollItemWage.hpp"
 #include "droqbxml/records/DroItemSalesTax.hpp"
+#include "droqbxml/records/DroItemSalesTaxGroup.hpp"
 #include "droqbxml/records/DroItemsCol.hpp"
 #include "droqbxml/records/DroSalesItems.hpp"
 #include "tests/TestSupport.hpp"
