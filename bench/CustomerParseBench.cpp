@@ -1,14 +1,10 @@
-// Reading a batch of customer query responses (one CustomerRet each, requestIDs 2, 3, ...,
-// optional elements mostly absent, as QuickBooks writes them) with DroCustomer.ParseRs, one
-// record after another from the returned cursor; and, on the same text in UTF-8, a parse
-// with pugixml for scale.
-#include <benchmark/benchmark.h>
-
-#include <pugixml.hpp>
+// The first DroCustomer.ParseRs over a batch of customer query responses (one CustomerRet
+// each, requestIDs 2, 3, ..., optional elements mostly absent, as QuickBooks writes them),
+// against pugixml on the same text (see FirstParse.hpp).
 #include <string>
 
+#include "bench/FirstParse.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
-#include "droqbxml/runtime/Utf.hpp"
 
 namespace droqbxml {
 namespace {
@@ -43,41 +39,18 @@ std::string batchResponse(int customers) {
   return text + "</QBXMLMsgsRs>\n</QBXML>\n";
 }
 
-void BM_CustomerWalk(benchmark::State& state) {
-  const auto customers = static_cast<int>(state.range(0));
-  const Text response = fromUtf8(batchResponse(customers));
-  int read = 0;
-  for (auto _ : state) {
-    // One record after another until a parse reads nothing. An optional element absent from
-    // a record is taken from a later one (the scan is not bounded by its record), so the
-    // walk skips the records in between, as hosts have always seen it do.
-    read = 0;
-    int32_t cursor = 1;
-    for (;;) {
-      DroCustomer customer;
-      cursor = customer.ParseRs(response, cursor);
-      if (customer.ListID().empty()) break;
-      ++read;
-    }
-  }
-  if (read == 0) state.SkipWithError("no customer was read");
-  state.counters["records_read"] = read;
-  state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) *
-                          static_cast<int64_t>(response.size() * 2));
+void BM_CustomerFirstParse(benchmark::State& state) {
+  bench::firstParseAgainstPugixml<DroCustomer>(state,
+                                               batchResponse(static_cast<int>(state.range(0))));
 }
 
-void BM_PugixmlParse(benchmark::State& state) {
-  const std::string response = batchResponse(static_cast<int>(state.range(0)));
-  for (auto _ : state) {
-    pugi::xml_document document;
-    benchmark::DoNotOptimize(document.load_buffer(response.data(), response.size()));
-  }
-  state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) *
-                          static_cast<int64_t>(response.size()));
-}
-
-BENCHMARK(BM_CustomerWalk)->Arg(1000)->Arg(10000)->Arg(50000)->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_PugixmlParse)->Arg(1000)->Arg(10000)->Arg(50000)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_CustomerFirstParse)
+    ->Arg(1000)
+    ->Arg(10000)
+    ->Arg(50000)
+    ->UseManualTime()
+    ->Iterations(15)
+    ->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace droqbxml
