@@ -93,6 +93,18 @@ TEST_F(CliStandInTest, DemoRunsOnAFreshCompanyAndAgain) {
   EXPECT_NE(first.out.find("Created company file"), std::string::npos);
   EXPECT_NE(first.out.find("<AccountQueryRq requestID=\"2\" />"), std::string::npos);
   EXPECT_NE(first.out.find("Session ended"), std::string::npos);
+  // Every accepted kind is read back from its add response; the refused ones are shown.
+  for (const char* dump : {"False\r\nRequestID\r\n\t2", "ITEM INVENTORY:", "ITEM NON INVENTORY:",
+                           "ITEM SUBTOTAL:", "ITEMDISCOUNT:", "ITEM OTHER CHARGE:", "ITEM SERVICE:",
+                           "ITEM PAYMENT:", "ITEM SALES TAX:"}) {
+    EXPECT_NE(first.out.find(dump), std::string::npos) << dump;
+  }
+  size_t refused = 0;
+  for (size_t at = first.out.find("As expected: QuickBooks' schema refuses");
+       at != std::string::npos; at = first.out.find("As expected", at + 1)) {
+    ++refused;
+  }
+  EXPECT_EQ(refused, 4u);
   const Result second = run({"demo", "--company", company_});
   EXPECT_EQ(second.code, cli::kExitSuccess) << second.err;
   EXPECT_NE(second.out.find("Using company file"), std::string::npos);
