@@ -9,6 +9,7 @@
 #include "droqbxml/runtime/Utf.hpp"
 #include "simulator/RequestDocument.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/qbxml/ItemSamples.hpp"
 
 namespace droqbxml {
 namespace {
@@ -103,134 +104,13 @@ TEST(SchemaDeparturesTest, CustomerAddWithEveryFieldTheBuilderWrites) {
   EXPECT_EQ(problems(builder.XML()), std::vector<std::string>{});
 }
 
-struct ItemSample {
-  const char* label;
-  udItemType kind;
-  Ref<Object> item;
-};
-
-// One item of each kind with every element its builder writes set to an accepted value.
-std::vector<ItemSample> itemSamples() {
-  const auto salesItem = [](auto item, bool salesOrPurchase) {
-    item->Name(u"Labour");
-    item->IsActive(u"true");
-    item->ParentRef()->FullName(u"Work");
-    item->SalesTaxCodeRef()->FullName(u"Non");
-    if (salesOrPurchase) {
-      item->SalesOrPurchase()->Desc(u"Per hour");
-      item->SalesOrPurchase()->Price(u"45");
-      item->SalesOrPurchase()->AccountRef()->FullName(u"Sales");
-    } else {
-      auto& side = *item->SalesAndPurchase();
-      side.SalesDesc(u"Haul");
-      side.SalesPrice(u"10");
-      side.IncomeAccountRef()->FullName(u"Sales");
-      side.PurchaseDesc(u"Truck");
-      side.PurchaseCost(u"5");
-      side.ExpenseAccountRef()->FullName(u"Cost of Goods Sold");
-      side.PrefVendorRef()->FullName(u"Haulers");
-    }
-    return item;
-  };
-  auto inventory = std::make_shared<DroItemInventory>();
-  inventory->Name(u"Tile");
-  inventory->IsActive(u"true");
-  inventory->ParentRef()->FullName(u"Floors");
-  inventory->SalesTaxCodeRef()->FullName(u"Tax");
-  inventory->SalesDesc(u"Tile");
-  inventory->SalesPrice(u"4");
-  inventory->IncomeAccountRef()->FullName(u"Sales");
-  inventory->PurchaseDesc(u"Tile");
-  inventory->PurchaseCost(u"2");
-  inventory->COGSAccountRef()->FullName(u"Cost of Goods Sold");
-  inventory->PrefVendorRef()->FullName(u"Tiles Inc");
-  inventory->AssetAccountRef()->FullName(u"Inventory Asset");
-  inventory->ReorderPoint(u"10");
-  auto subtotal = std::make_shared<DroItemSubtotal>();
-  subtotal->Name(u"Sub");
-  subtotal->IsActive(u"true");
-  subtotal->ItemDesc(u"Subtotal");
-  auto discount = std::make_shared<DroItemDiscount>();
-  discount->Name(u"Disc");
-  discount->IsActive(u"true");
-  discount->ParentRef()->FullName(u"Discounts");
-  discount->ItemDesc(u"Ten off");
-  discount->SalesTaxCodeRef()->FullName(u"Non");
-  discount->DiscountRate(u"10");
-  discount->AccountRef()->FullName(u"Discounts Given");
-  auto percentDiscount = std::make_shared<DroItemDiscount>();
-  percentDiscount->Name(u"Pct");
-  percentDiscount->DiscountRatePercent(u"10");
-  percentDiscount->AccountRef()->FullName(u"Discounts Given");
-  auto bothRates = std::make_shared<DroItemDiscount>();
-  bothRates->Name(u"Both");
-  bothRates->DiscountRate(u"10");
-  bothRates->DiscountRatePercent(u"10");
-  bothRates->AccountRef()->FullName(u"Discounts Given");
-  auto group = std::make_shared<DroItemGroup>();
-  group->Name(u"Kit");
-  group->IsActive(u"true");
-  group->ItemDesc(u"Kit");
-  group->IsPrintItemsInGroup(u"true");
-  const auto line = group->ItemGroupLines()->Add();
-  line->ItemRef()->FullName(u"Tile");
-  line->Quantity(u"3");
-  auto payment = std::make_shared<DroItemPayment>();
-  payment->Name(u"Cash");
-  payment->IsActive(u"true");
-  payment->ItemDesc(u"Cash");
-  payment->DepositToAccountRef()->FullName(u"Undeposited Funds");
-  payment->PaymentMethodRef()->FullName(u"Cash");
-  auto tax = std::make_shared<DroItemSalesTax>();
-  tax->Name(u"State");
-  tax->IsActive(u"true");
-  tax->ItemDesc(u"State tax");
-  tax->TaxRate(u"7.5");
-  tax->TaxVendorRef()->FullName(u"Revenue");
-  auto taxGroup = std::make_shared<DroItemSalesTaxGroup>();
-  taxGroup->Name(u"Both");
-  taxGroup->IsActive(u"true");
-  taxGroup->ItemDesc(u"State and city");
-  return {
-      {"inventory", udItemInventory, inventory},
-      {"non-inventory, sales or purchase", udItemNonInventory,
-       salesItem(std::make_shared<DroItemNonInventory>(), true)},
-      {"non-inventory, sales and purchase", udItemNonInventory,
-       salesItem(std::make_shared<DroItemNonInventory>(), false)},
-      {"subtotal", udItemSubtotal, subtotal},
-      {"discount, amount", udItemDiscount, discount},
-      {"discount, percentage", udItemDiscount, percentDiscount},
-      {"discount, both rates", udItemDiscount, bothRates},
-      {"group", udItemGroup, group},
-      {"other charge, sales or purchase", udItemOtherCharge,
-       salesItem(std::make_shared<DroItemOtherCharge>(), true)},
-      {"other charge, sales and purchase", udItemOtherCharge,
-       salesItem(std::make_shared<DroItemOtherCharge>(), false)},
-      {"payment", udItemPayment, payment},
-      {"sales tax", udItemSalesTax, tax},
-      {"sales tax group", udItemSalesTaxGroup, taxGroup},
-      {"service, sales or purchase", udItemService,
-       salesItem(std::make_shared<DroItemService>(), true)},
-      {"service, sales and purchase", udItemService,
-       salesItem(std::make_shared<DroItemService>(), false)},
-  };
-}
-
 TEST(SchemaDeparturesTest, AccountAndItemAdds) {
-  auto account = std::make_shared<DroAccount>();
-  account->Name(u"Tools");
-  account->IsActive(u"true");
-  account->ParentRef()->FullName(u"Assets");
-  account->AccountType(u"FixedAsset");
-  account->DetailAccountType(u"MachineryAndEquipment");
-  account->AccountNumber(u"1500");
-  account->BankNumber(u"BN-7");
-  account->Desc(u"Shop tools");
+  const auto account = test::accountSample();
   DroXmlBuilder builder;
   builder.BuildAddAccount(account);
   std::string found = "account\n";
   for (const auto& problem : problems(builder.XML())) found += "  " + problem + "\n";
-  for (const auto& sample : itemSamples()) {
+  for (const auto& sample : test::itemSamples()) {
     builder.BuildAddItem(sample.kind, Variant(sample.item));
     found += std::string(sample.label) + "\n";
     for (const auto& problem : problems(builder.XML())) found += "  " + problem + "\n";

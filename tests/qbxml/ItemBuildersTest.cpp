@@ -3,8 +3,6 @@
 // with the members by name, a member it lacks, an object of the wrong class).
 #include <gtest/gtest.h>
 
-#include <functional>
-
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/qbxml/DroXmlBuilder.hpp"
 #include "droqbxml/records/DroAccount.hpp"
@@ -18,6 +16,7 @@
 #include "droqbxml/records/DroSalesItems.hpp"
 #include "droqbxml/runtime/Binding.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/qbxml/ItemSamples.hpp"
 
 namespace droqbxml {
 namespace {
@@ -57,100 +56,34 @@ Text build(udItemType kind, const Ref<Object>& item) {
   return builder.XML();
 }
 
-TEST(ItemBuildersTest, EachBuilderWritesItsDocument) {
-  auto account = std::make_shared<DroAccount>();
-  account->Name(u"Tools & <Dies>");
-  account->IsActive(u"1");
-  account->ParentRef()->ListID(u"80-1");
-  account->ParentRef()->FullName(u"Assets");
-  account->AccountType(u"fixedasset");
-  account->AccountNumber(u"1500");
-  account->BankNumber(u"BN-7");
-  account->Desc(u"Shop tools");
-  account->OpenBalance(u"100");  // never sent
-  auto plainAccount = std::make_shared<DroAccount>();
-  plainAccount->Name(u"Misc");
-
-  auto nonInv = std::make_shared<DroItemNonInventory>();
-  nonInv->Name(u"Grout");
-  nonInv->SalesTaxCodeRef()->FullName(u"Tax");
-  nonInv->SalesOrPurchase()->Price(u"2.5");
-  nonInv->SalesOrPurchase()->PricePercent(u"3");
-  auto emptyNonInv = std::make_shared<DroItemNonInventory>();
-  auto inventory = std::make_shared<DroItemInventory>();
-  inventory->Name(u"Tile");
-  inventory->SalesPrice(u"4");
-  inventory->IncomeAccountRef()->FullName(u"Sales");
-  inventory->PrefVendorRef()->ListID(u"V1");
-  inventory->ReorderPoint(u"10");
-  inventory->QuantityOnHand(u"99");  // never sent
-  auto subtotal = std::make_shared<DroItemSubtotal>();
-  subtotal->Name(u"Sub");
-  subtotal->ItemDesc(u"Subtotal");
-  auto discount = std::make_shared<DroItemDiscount>();
-  discount->Name(u"Disc");
-  discount->DiscountRate(u"5");
-  discount->DiscountRatePercent(u"10");
-  discount->AccountRef()->FullName(u"Discounts");
-  auto group = std::make_shared<DroItemGroup>();
-  group->Name(u"Kit");
-  group->IsPrintItemsInGroup(u"true");
-  group->ItemGroupLines()->Add()->Quantity(u"5");  // no item: left out
-  const auto line = group->ItemGroupLines()->Add();
-  line->ItemRef()->FullName(u"Tile");
-  line->Quantity(u"3");
-  auto other = std::make_shared<DroItemOtherCharge>();
-  other->Name(u"Haul");
-  other->ParentRef()->FullName(u"Charges");
-  other->SalesAndPurchase()->PurchaseCost(u"7");
-  auto payment = std::make_shared<DroItemPayment>();
-  payment->Name(u"Cash");
-  payment->ItemDesc(u"Paid in cash");
-  payment->DepositToAccountRef()->FullName(u"Undeposited Funds");
-  auto tax = std::make_shared<DroItemSalesTax>();
-  tax->Name(u"State");
-  tax->TaxRate(u"7.50");
-  tax->TaxVendorRef()->FullName(u"Revenue");
-  auto taxGroup = std::make_shared<DroItemSalesTaxGroup>();
-  taxGroup->Name(u"Both");
-  taxGroup->ItemDesc(u"State and city");
-  auto service = std::make_shared<DroItemService>();
-  service->Name(u"Labour");
-  service->SalesOrPurchase()->Desc(u"Per hour");
-  service->SalesOrPurchase()->AccountRef()->ListID(u"40-1");
-
-  const std::vector<std::pair<std::function<Text()>, std::string>> cases{
-      {[&] {
-         DroXmlBuilder builder;
-         builder.BuildAddAccount(account);
-         return builder.XML();
-       },
-       "account_add.xml"},
-      {[&] {
-         DroXmlBuilder builder;
-         builder.BuildAddAccount(plainAccount);
-         return builder.XML();
-       },
-       "account_add_name_only.xml"},
-      {[&] { return build(udItemNonInventory, nonInv); }, "item_non_inventory_add.xml"},
-      {[&] { return build(udItemNonInventory, emptyNonInv); }, "item_non_inventory_add_empty.xml"},
-      {[&] { return build(udItemInventory, inventory); }, "item_inventory_add.xml"},
-      {[&] { return build(udItemSubtotal, subtotal); }, "item_subtotal_add.xml"},
-      {[&] { return build(udItemDiscount, discount); }, "item_discount_add.xml"},
-      {[&] { return build(udItemGroup, group); }, "item_group_add.xml"},
-      {[&] { return build(udItemOtherCharge, other); }, "item_other_charge_add.xml"},
-      {[&] { return build(udItemPayment, payment); }, "item_payment_add.xml"},
-      {[&] { return build(udItemSalesTax, tax); }, "item_sales_tax_add.xml"},
-      {[&] { return build(udItemSalesTaxGroup, taxGroup); }, "item_sales_tax_group_add.xml"},
-      {[&] { return build(udItemService, service); }, "item_service_add.xml"},
-      {[&] { return build(udItemSubtotal, std::make_shared<HostSubtotal>(true)); },
-       "item_subtotal_add_host_object.xml"},
-  };
-  for (const auto& [document, golden] : cases) {
-    EXPECT_TRUE(test::matchesGolden(document(), "requests/" + golden)) << golden;
+std::string goldenName(std::string label) {
+  for (char& c : label) c = (c == ' ' || c == ',' || c == '-') ? '_' : c;
+  std::string name;
+  for (const char c : label) {
+    if (c != '_' || name.empty() || name.back() != '_') name += c;
   }
+  return "requests/item_" + name + "_add.xml";
+}
+
+TEST(ItemBuildersTest, EachBuilderWritesItsDocument) {
+  DroXmlBuilder builder;
+  const auto account = test::accountSample();
+  builder.BuildAddAccount(account);
+  EXPECT_TRUE(test::matchesGolden(builder.XML(), "requests/account_add.xml"));
   EXPECT_EQ(account->RequestID(), u"2");
-  EXPECT_EQ(service->RequestID(), u"2");
+  auto plainAccount = std::make_shared<DroAccount>();
+  plainAccount->Name(u"Misc & <Co>");
+  builder.BuildAddAccount(plainAccount);
+  EXPECT_TRUE(test::matchesGolden(builder.XML(), "requests/account_add_name_only.xml"));
+  for (const auto& sample : test::itemSamples()) {
+    EXPECT_TRUE(test::matchesGolden(build(sample.kind, sample.item), goldenName(sample.label)))
+        << sample.label;
+  }
+  EXPECT_TRUE(
+      test::matchesGolden(build(udItemNonInventory, std::make_shared<DroItemNonInventory>()),
+                          "requests/item_non_inventory_empty_add.xml"));
+  EXPECT_TRUE(test::matchesGolden(build(udItemSubtotal, std::make_shared<HostSubtotal>(true)),
+                                  "requests/item_subtotal_host_object_add.xml"));
 }
 
 TEST(ItemBuildersTest, WhatBuildsNothingOrStopsHalfway) {
