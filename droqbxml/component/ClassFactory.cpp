@@ -19,6 +19,16 @@
 #include "droqbxml/records/DroAddress.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
+#include "droqbxml/records/DroEstimate.hpp"
+#include "droqbxml/records/DroEstimateLine.hpp"
+#include "droqbxml/records/DroEstimateLineCol.hpp"
+#include "droqbxml/records/DroEstimateLineGroup.hpp"
+#include "droqbxml/records/DroEstimateLineGroupCol.hpp"
+#include "droqbxml/records/DroInvoice.hpp"
+#include "droqbxml/records/DroInvoiceLine.hpp"
+#include "droqbxml/records/DroInvoiceLineCol.hpp"
+#include "droqbxml/records/DroInvoiceLineGroup.hpp"
+#include "droqbxml/records/DroInvoiceLineGroupCol.hpp"
 #include "droqbxml/records/DroItemDiscount.hpp"
 #include "droqbxml/records/DroItemGroup.hpp"
 #include "droqbxml/records/DroItemGroupLine.hpp"
@@ -53,7 +63,7 @@ Ref<Object> make() {
   return std::make_shared<T>();
 }
 
-constexpr std::array<CreatableClass, 33> kClasses{{
+constexpr std::array<CreatableClass, 43> kClasses{{
     {u"DroXmlProcessor", &make<DroXmlProcessor>},
     {u"clsMyErr", &make<clsMyErr>},
     {u"clsAppPathAccess", &make<clsAppPathAccess>},
@@ -87,6 +97,16 @@ constexpr std::array<CreatableClass, 33> kClasses{{
     {u"DroItemGroupLineCol", &make<DroItemGroupLineCol>},
     {u"DroPaymentMethod", &make<DroPaymentMethod>},
     {u"DroItemsCol", &make<DroItemsCol>},
+    {u"DroEstimate", &make<DroEstimate>},
+    {u"DroEstimateLine", &make<DroEstimateLine>},
+    {u"DroEstimateLineCol", &make<DroEstimateLineCol>},
+    {u"DroEstimateLineGroup", &make<DroEstimateLineGroup>},
+    {u"DroEstimateLineGroupCol", &make<DroEstimateLineGroupCol>},
+    {u"DroInvoice", &make<DroInvoice>},
+    {u"DroInvoiceLine", &make<DroInvoiceLine>},
+    {u"DroInvoiceLineCol", &make<DroInvoiceLineCol>},
+    {u"DroInvoiceLineGroup", &make<DroInvoiceLineGroup>},
+    {u"DroInvoiceLineGroupCol", &make<DroInvoiceLineGroupCol>},
 }};
 
 }  // namespace

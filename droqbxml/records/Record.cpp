@@ -55,15 +55,15 @@ OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView retu
                             const Text& requestId) {
   using basCommonProcs::findInResponse;
   const int32_t start = startPoint < 1 ? 1 : startPoint;
-  if (findInResponse(start, value, returnTag) == 0) return {false, 0, 0};
+  if (findInResponse(start, value, returnTag) == 0) return {false, false, 0, 0};
   const int32_t attribute = findInResponse(start, value, u"requestID=");
   const int32_t open = attribute == 0 ? 0 : findInResponse(attribute, value, u"\"");
   const int32_t close = open == 0 ? 0 : findInResponse(open + 1, value, u"\"");
-  if (close == 0) return {false, start, 0};
+  if (close == 0) return {false, false, start, 0};
   const TextView id =
       TextView(value).substr(static_cast<size_t>(open), static_cast<size_t>(close - open - 1));
-  if (!requestId.empty() && id != requestId) return {false, close, 0};
-  return {true, start, close};
+  if (!requestId.empty() && id != requestId) return {false, true, close, 0};
+  return {true, false, start, close};
 }
 
 Record::Record(std::span<const FieldSpec> fields) : fields_(fields), values_(fields.size()) {}

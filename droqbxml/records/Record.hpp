@@ -110,12 +110,13 @@ class ObjectProperty : public Ref<T> {
 // record is to be read from `cursor`, or `result` is what its ParseRs returns at once.
 struct OwnResponse {
   bool found = false;
+  bool another = false;  // the identifier found is another request's
   int32_t result = 0;  // the clamped start when found
   int32_t cursor = 0;  // the closing quote of the request identifier
 };
 // From StartPoint (raised to 1): 0 without returnTag; the start without "requestID=" (or
-// with its quotes cut short); the closing-quote position when the identifier is another
-// request's and requestId is not ""; otherwise found.
+// with its quotes cut short); the closing-quote position (and another) when the identifier
+// is another request's and requestId is not ""; otherwise found.
 OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView returnTag,
                             const Text& requestId);
 
