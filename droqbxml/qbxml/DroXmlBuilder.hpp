@@ -20,6 +20,8 @@ namespace droqbxml {
 class DroAccount;
 class DroCustomer;
 class DroCustomerCol;
+class DroEstimate;
+class DroInvoice;
 
 class DroXmlBuilder final : public Object {
  public:
@@ -117,6 +119,12 @@ class DroXmlBuilder final : public Object {
   // leaving the document incomplete. Payroll wage, udUnknown and any other value build
   // nothing and leave XML as it was.
   void BuildAddItem(udItemType ItemType, const Variant& Item);
+  // The request adding one estimate, or one invoice: the header elements the host set (the
+  // customer reference always), then every plain line, then every line group; the
+  // record's RequestID becomes the request's identifier. Values are escaped, not checked.
+  // bTaxable true keeps every line's tax code reference out of the request.
+  void BuildAddEstimate(const Ref<DroEstimate>& Estimate, bool bTaxable = false);
+  void BuildAddInvoice(const Ref<DroInvoice>& Invoice, bool bTaxable = false);
 
   // True when the first "requestID=" of the response carries ReqID (any id when ReqID is
   // empty) and the first "statusCode=" after it is "0". A status code without a closing

@@ -13,6 +13,8 @@
 #include "droqbxml/records/DroAccount.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
+#include "droqbxml/records/DroEstimate.hpp"
+#include "droqbxml/records/DroInvoice.hpp"
 #include "droqbxml/runtime/Binding.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -83,6 +85,8 @@ const ClassInfo& DroXmlBuilder::typeInfo() {
         .method(u"BuildQueryByFullName", &B::BuildQueryByFullName)
         .method(u"BuildQueryByListID", &B::BuildQueryByListID)
         .method(u"BuildQueryByActiveOrDate", &B::BuildQueryByActiveOrDate)
+        .method(u"BuildAddEstimate", &B::BuildAddEstimate)
+        .method(u"BuildAddInvoice", &B::BuildAddInvoice)
         .method(u"IsSuccessRs", &B::IsSuccessRs)
         .method(u"XmlEscapeX", &B::XmlEscapeX);
     return ClassInfo(u"DroXmlBuilder", members.take());

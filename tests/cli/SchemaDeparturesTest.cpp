@@ -10,6 +10,7 @@
 #include "simulator/RequestDocument.hpp"
 #include "tests/TestSupport.hpp"
 #include "tests/qbxml/ItemSamples.hpp"
+#include "tests/qbxml/TxnSamples.hpp"
 
 namespace droqbxml {
 namespace {
@@ -116,6 +117,22 @@ TEST(SchemaDeparturesTest, AccountAndItemAdds) {
     for (const auto& problem : problems(builder.XML())) found += "  " + problem + "\n";
   }
   EXPECT_TRUE(test::matchesGolden(fromUtf8(found), "requests/schema_departures_items.txt"));
+}
+
+TEST(SchemaDeparturesTest, EstimateAndInvoiceAdds) {
+  DroXmlBuilder builder;
+  std::string found;
+  const auto list = [&](const std::string& label) {
+    found += label + "\n";
+    for (const auto& problem : problems(builder.XML())) found += "  " + problem + "\n";
+  };
+  builder.BuildAddEstimate(test::estimateSample());
+  list("estimate");
+  builder.BuildAddEstimate(std::make_shared<DroEstimate>());
+  list("estimate, nothing set");
+  builder.BuildAddInvoice(test::invoiceSample());
+  list("invoice");
+  EXPECT_TRUE(test::matchesGolden(fromUtf8(found), "requests/schema_departures_transactions.txt"));
 }
 
 }  // namespace
