@@ -28,6 +28,8 @@ class CollectionOf : public Object {
     return items_.Item(vntIndexKey.toText());
   }
   int32_t Count() const { return items_.Count(); }
+  // Whether Item(key) finds a member (keys are compared ignoring ASCII case).
+  bool Contains(const Text& key) const { return items_.Contains(key); }
   void Remove(const Variant& vntIndexKey) {
     if (isCollectionPosition(vntIndexKey)) {
       items_.Remove(vntIndexKey.toLong());

@@ -21,21 +21,15 @@ Text peekElement(const Text& value, TextView name, int32_t& start, int32_t end, 
 // Whether to let errors of a fresh member's add and parse reach the caller.
 enum class Fresh : bool { Suppressed, Raises };
 
-// Reads into the member held under key; when the lookup fails with the runtime's 5 (no such
-// key), into a fresh member added under it (without a key when key is ""). Errors of the
-// lookup and of an existing member's parse are swallowed, as the loops have always done;
-// those of the fresh member's add and parse as `fresh` says.
+// Reads into the member held under key, else into a fresh member added under it (without a
+// key when key is ""). Errors of an existing member's parse are swallowed, as the loops have
+// always done; those of the fresh member's add and parse as `fresh` says.
 template <class T, class Parse>
 void parseKeyed(RecordCol<T>& members, const Text& key, Fresh fresh, Parse parse) {
-  Ref<T> held;
-  try {
-    held = members.Item(Variant(key));
-  } catch (const ComError& error) {
-    if (error.number() != RuntimeError::kInvalidProcedureCall) return;
-  }
-  if (held) {
+  // Looked up without raising: a missing key is the lookup's only failure.
+  if (members.Contains(key)) {
     try {
-      parse(*held);
+      parse(*members.Item(Variant(key)));
     } catch (const ComError&) {
     }
     return;
@@ -122,6 +116,7 @@ const ClassInfo& DroTxnLineCol<Kind>::typeInfo() {
 
 template <TxnKind Kind>
 void DroTxnLineCol<Kind>::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
+  const internal::SearchScope scope(Value);
   const TextView tag = kTxnKinds[static_cast<size_t>(Kind)].lineTag;
   const auto parse = [&](DroTxnLine<Kind>& line) { line.ParseRs(Value, StartPoint, EndPoint); };
   // Set by the first description that matches a member and never cleared: after it, a
@@ -191,6 +186,7 @@ Variant DroTxnLineGroup<Kind>::IsEmpty() const {
 
 template <TxnKind Kind>
 void DroTxnLineGroup<Kind>::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
+  const internal::SearchScope scope(Value);
   const Text context(kSpec.groupContext);
   itemGroupRef_->ParseRs(u"ItemGroupRef", Value, StartPoint, EndPoint, true, context);
   FieldReader<DroTxnLineGroup> read(*this, Value, StartPoint, EndPoint, context);

@@ -19,6 +19,7 @@
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/records/Record.hpp"
 #include "droqbxml/records/RecordCol.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 
 namespace droqbxml {
 
@@ -256,6 +257,7 @@ template <class Derived, TxnKind Kind>
 template <class Header>
 int32_t TxnRecordOf<Derived, Kind>::parseTxn(const Text& Value, int32_t StartPoint,
                                              Header readHeader) {
+  const internal::SearchScope scope(Value);
   int32_t position = StartPoint > 0 ? StartPoint : 1;
   for (;;) {
     const OwnResponse own = findOwnResponse(Value, position, kSpec.returnTag, RequestID());

@@ -37,7 +37,7 @@ size_t selfClosingAt(const Text& value, size_t cursor, TextView name) {
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {
   if (start < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   if (static_cast<size_t>(start) > text.size() + 1) return 0;
-  const size_t at = internal::findForward(text, what, static_cast<size_t>(start - 1));
+  const size_t at = internal::SearchScope::find(text, what, static_cast<size_t>(start - 1));
   return at == Text::npos ? 0 : static_cast<int32_t>(at + 1);
 }
 

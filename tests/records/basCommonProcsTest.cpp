@@ -86,12 +86,18 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
                                         u"x",   u"<",    u"<A><", u"<B/>", u"AB", u"\r\n"};
   Text text;
   while (text.size() < 100000) text += pieces[random() % std::size(pieces)];
+  const Text other = text.substr(1);
+  // Inside a read's scope too, with cursors that go back as well as forward, and for a text
+  // the scope is not over.
+  const internal::SearchScope scope(text);
   for (int round = 0; round < 2000; ++round) {
     const size_t from = random() % (text.size() + 10);
     for (const TextView pattern : {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"),
                                    TextView(u"<C>"), TextView(u"A><"), TextView(u"<")}) {
       ASSERT_EQ(internal::findForward(text, pattern, from), text.find(pattern, from))
           << round << " " << toUtf8(Text(pattern));
+      ASSERT_EQ(internal::SearchScope::find(text, pattern, from), text.find(pattern, from));
+      ASSERT_EQ(internal::SearchScope::find(other, pattern, from), other.find(pattern, from));
     }
   }
   // Matches at every offset near the end, where the wide comparison hands over.

@@ -53,4 +53,35 @@ size_t findForward(TextView text, TextView pattern, size_t from) {
   return TextView::npos;
 }
 
+namespace {
+thread_local SearchScope* openScope = nullptr;
+}  // namespace
+
+SearchScope::SearchScope(const Text& text) {
+  if (openScope != nullptr) return;
+  text_ = &text;
+  openScope = this;
+}
+
+SearchScope::~SearchScope() {
+  if (openScope == this) openScope = nullptr;
+}
+
+size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
+  SearchScope* scope = openScope;
+  if (scope == nullptr || scope->text_ != &text) return findForward(text, pattern, from);
+  auto known = scope->answers_.find(pattern);
+  if (known != scope->answers_.end()) {
+    const Answer& answer = known->second;
+    // Nothing from `from` on means nothing later either; a match from `from` is the first
+    // match from any start up to it.
+    if (from >= answer.from && (answer.at == Text::npos || from <= answer.at)) return answer.at;
+  } else {
+    known = scope->answers_.emplace(Text(pattern), Answer{}).first;
+  }
+  const size_t at = findForward(text, pattern, from);
+  known->second = Answer{from, at};
+  return at;
+}
+
 }  // namespace droqbxml::internal
