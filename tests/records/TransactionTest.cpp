@@ -170,6 +170,32 @@ TEST(TransactionTest, GroupLoopQuirks) {
             u"<IsPrintItemsInGroup>'.\r\nThis element is not allowed to be empty.");
 }
 
+// Every cut of a response that has lines, groups, nested lines and both kinds in it is
+// either read or refused with an error: no crash, no endless loop.
+TEST(TransactionTest, CutResponsesEndInAnAnswerOrAnError) {
+  const Text text = document(
+      response(u"Estimate", u"2", u"E",
+               line(u"Estimate", u"L1", u"", u"Note") + line(u"Estimate", u"L2", u"Tile", u"T") +
+                   group(u"Estimate", u"Kit", u"K", line(u"Estimate", u"N", u"Tile", u"T")) +
+                   group(u"Estimate", u"Kit", u"K")) +
+      response(u"Invoice", u"3", u"I",
+               line(u"Invoice", u"", u"", u"Note") + group(u"Invoice", u"", u"") +
+                   line(u"Invoice", u"L", u"Tile", u"T")));
+  for (size_t size = 0; size <= text.size(); ++size) {
+    const Text cut = text.substr(0, size);
+    DroEstimate estimate;
+    DroInvoice invoice;
+    try {
+      estimate.ParseRs(cut);
+    } catch (const ComError&) {
+    }
+    try {
+      invoice.ParseRs(cut);
+    } catch (const ComError&) {
+    }
+  }
+}
+
 TEST(TransactionTest, GroupEmptinessIsWorkedOutOnEveryCall) {
   DroEstimateLineGroup estimateGroup;
   EXPECT_TRUE(estimateGroup.IsEmpty().toBoolean());
