@@ -287,6 +287,13 @@ int64_t Store::insertList(ListTable table, ListRecord& record) {
   return record.id;
 }
 
+void Store::updateFields(ListTable table, int64_t id, const std::vector<Field>& fields) {
+  Statement& update =
+      statement("UPDATE " + std::string(tableName(table)) + " SET fields = ? WHERE id = ?");
+  update.bindBlob(1, encodeFields(fields)).bind(2, id);
+  update.step();
+}
+
 std::optional<int64_t> Store::findByListId(ListTable table, std::string_view listId) {
   const auto parsed = parseListId(listId);
   if (!parsed) return std::nullopt;

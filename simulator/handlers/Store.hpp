@@ -136,6 +136,8 @@ class Store {
   std::optional<ListRecord> list(ListTable table, int64_t id);
   // Adds the entry under the next ListID number, which it sets in `record` and returns.
   int64_t insertList(ListTable table, ListRecord& record);
+  // Replaces the fields of an entry (its times and EditSequence stay).
+  void updateFields(ListTable table, int64_t id, const std::vector<Field>& fields);
   std::optional<int64_t> findByListId(ListTable table, std::string_view listId);
   std::optional<int64_t> findByFullName(ListTable table, std::string_view fullName);
   // The ListID and FullName of an entry, looked up once per Store.

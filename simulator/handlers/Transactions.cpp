@@ -207,6 +207,23 @@ class LineBuilder {
   int64_t taxable_ = 0;
 };
 
+// An invoice takes what it sells from stock: each line of an inventory item (group members
+// included) lowers the item's quantity on hand by the line's quantity, below zero if need
+// be; its average cost stays. Estimates sell nothing.
+void sellFromStock(Context& context, const std::vector<TxnLine>& lines) {
+  for (const TxnLine& line : lines) {
+    const Field* itemRef = findField(line.fields, "ItemRef");
+    const auto quantity = number(line.fields, "Quantity");
+    if (line.kind == LineKind::Group || itemRef == nullptr || !quantity) continue;
+    auto item = context.store.list(ListTable::Items, itemRef->row);
+    if (!item || static_cast<ItemKind>(item->kind) != ItemKind::Inventory) continue;
+    const int64_t onHand = number(item->fields, "QuantityOnHand").value_or(0) - *quantity;
+    setField(item->fields,
+             Field::value("QuantityOnHand", formatNumber(onHand, NumberKind::Quantity)));
+    context.store.updateFields(ListTable::Items, item->id, item->fields);
+  }
+}
+
 // The RefNumber QuickBooks gives a transaction that has none: the last one of its kind with
 // its trailing number counted up ("1005" after "1004", "INV-010" after "INV-009"), else "1".
 std::string nextRefNumber(Context& context, TxnTable table) {
@@ -395,6 +412,7 @@ Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
   txn.modified = context.now;
   txn.lines = std::move(lines.lines());
   context.store.insertTxn(kind.table, txn);
+  if (kind.invoice) sellFromStock(context, txn.lines);
   answer.records.push_back(txnRet(context, kind, txn, true));
   return answer;
 }

@@ -550,6 +550,22 @@ TEST_F(RequestHandlersTest, LinesArePricedAndTaxedAsQuickBooksDoes) {
   EXPECT_EQ(texts(small, "RefNumber"), Texts{"2"});
 }
 
+TEST_F(RequestHandlersTest, InvoicesSellFromStock) {
+  answer(kAcmeAndItems +
+         rq("ItemInventoryAdd{Name=Tile;SalesPrice=40;QuantityOnHand=10;TotalValue=250};"
+            "ItemGroupAdd{Name=Tile Kit;ItemGroupLine{ItemRef=Tile;Quantity=4}}"));
+  // Three sold, four and four more in two kits; an estimate and a refused invoice sell
+  // nothing; below zero is allowed.
+  answer(rq("InvoiceAdd{CustomerRef=Acme;InvoiceLineAdd{ItemRef=Tile;Quantity=3};"
+            "InvoiceLineAdd{ItemRef=Labor;Quantity=1};InvoiceLineGroupAdd{ItemGroupRef=Tile Kit;"
+            "Quantity=2}};EstimateAdd{CustomerRef=Acme;EstimateLineAdd{ItemRef=Tile;Quantity=5}};"
+            "InvoiceAdd{CustomerRef=Nobody;InvoiceLineAdd{ItemRef=Tile;Quantity=1}}"),
+         "continueOnError");
+  const std::string tile = answer(rq("ItemInventoryQuery{FullName=Tile}"));
+  EXPECT_EQ(texts(tile, "QuantityOnHand"), Texts{"-1"});
+  EXPECT_EQ(texts(tile, "AverageCost"), Texts{"25.00"});
+}
+
 TEST_F(RequestHandlersTest, TransactionsNumberThemselvesAndTakeTheCustomersDefaults) {
   answer(rq("CustomerAdd{Name=Acme;BillAddress{Addr1=1 Main St};ShipAddress{Addr1=Dock 4}}"));
   const std::string response = answer(
