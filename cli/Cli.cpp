@@ -159,8 +159,12 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
   lint->add_option("FILE", file, "Request document, or - for standard input")->required();
 
   auto* demo = app.add_subcommand(
-      "demo", "Query a company file of the embedded stand-in and show every exchange");
+      "demo",
+      "Add customers, items, an estimate and an invoice to a company file of the embedded "
+      "stand-in, a line a step");
   addConnectionOptions(*demo, connection);
+  bool verbose = false;
+  demo->add_flag("--verbose,-v", verbose, "Print every request, response and record dump");
 
   try {
     app.parse(argc, argv);
@@ -187,7 +191,7 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
     if (allow->parsed()) return companyAllowCommand(io, company);
     if (deny->parsed()) return companyDenyCommand(io, company);
     if (lint->parsed()) return lintCommand(io, file);
-    if (demo->parsed()) return demoCommand(io, connection);
+    if (demo->parsed()) return demoCommand(io, connection, verbose);
   } catch (const ComError& error) {
     err << "droqbxml: " << error.what() << " (error " << error.number() << ", "
         << toUtf8(error.source()) << ")\n";

@@ -99,7 +99,7 @@ int companyShowCommand(Io io, const CompanyOptions& options);
 int companyAllowCommand(Io io, const CompanyOptions& options);
 int companyDenyCommand(Io io, const CompanyOptions& options);
 int lintCommand(Io io, const std::string& file);
-int demoCommand(Io io, const ConnectionOptions& connection);
+int demoCommand(Io io, const ConnectionOptions& connection, bool verbose = false);
 
 // Reads a request document from a file, or from the input stream for "-"; reports an
 // unreadable file and returns nothing.

@@ -1,12 +1,16 @@
 // droqbxml demo: the main job on a new machine. It creates (or reuses) a company file of
 // the embedded stand-in, opens a connection and a session through the facade, sends the
-// builder's queries for accounts, items and customers, adds a customer, a job, an account
-// and an item of every kind the component builds, reads each back from its add response,
-// and prints every exchange. Requests that QuickBooks' schema refuses as the component
-// writes them are sent too, and shown with the status and what lint finds in them.
+// builder's queries for accounts, items and customers, adds a customer, a job, an account,
+// an item of every kind the component builds, an estimate and an invoice with lines and a
+// line group, and reads each back from its add response. Requests that QuickBooks' schema
+// refuses as the component writes them are sent too. A second company file, with sales tax
+// off, shows how QuickBooks refuses line tax codes. One line a step and a summary; with
+// --verbose, every request, response and record dump as well.
+#include <algorithm>
 #include <filesystem>
 #include <functional>
-#include <iostream>
+#include <initializer_list>
+#include <ostream>
 #include <string>
 #include <system_error>
 #include <utility>
@@ -34,79 +38,194 @@ Text runLabel(const Text& customerQueryResponse) {
 
 constexpr const char* kRule = "------------------------------------------------------------";
 
-// Sends one request and prints it with the answer; where the stand-in's schema check
-// refused it, also the lint diagnosis of the request.
-Text exchange(Io io, Session& session, const std::string& title, const Text& request) {
-  io.out << kRule << '\n' << title << "\n" << kRule << "\nRequest:\n" << toUtf8(request) << "\n\n";
-  const Text response = session.send(request);
-  io.out << "Response status: " << statusText(session.status()) << "\nResponse:\n"
-         << toUtf8(response) << (response.empty() || response.back() != u'\n' ? "\n" : "") << '\n';
-  if (session.status() == RSParsingError) {
-    io.out << "QuickBooks refused the document. What lint finds in it:\n";
-    for (const auto& problem : simulator::readRequest(toUtf8(request)).problems) {
-      io.out << "  line " << problem.line << ": " << problem.element << ": " << problem.message
-             << '\n';
+// The first value of an element in a response, "" when there is none.
+std::string firstValue(const Text& response, const std::string& name) {
+  const Text open = fromUtf8("<" + name + ">");
+  const size_t at = response.find(open);
+  if (at == Text::npos) return {};
+  const size_t from = at + open.size();
+  const size_t close = response.find(u'<', from);
+  return close == Text::npos ? std::string() : toUtf8(response.substr(from, close - from));
+}
+
+// How many records of one kind a response holds.
+size_t countOf(const Text& response, const std::string& retTag) {
+  const Text open = fromUtf8("<" + retTag + ">");
+  size_t count = 0;
+  for (size_t at = response.find(open); at != Text::npos; at = response.find(open, at + 1)) {
+    ++count;
+  }
+  return count;
+}
+
+// The first response's status as QuickBooks wrote it, when it is not plain success.
+std::string quickBooksStatus(const Text& response) {
+  // The text of an attribute up to the first of `ends` after it.
+  const auto attribute = [&](const char* name, std::initializer_list<TextView> ends) {
+    const Text key = fromUtf8(std::string(name) + "=\"");
+    const size_t at = response.find(key);
+    if (at == Text::npos) return std::string();
+    const size_t from = at + key.size();
+    size_t close = Text::npos;
+    for (const TextView end : ends) close = std::min(close, response.find(end, from));
+    return close == Text::npos ? std::string() : toUtf8(response.substr(from, close - from));
+  };
+  const std::string code = attribute("statusCode", {u"\""});
+  if (code.empty() || code == "0") return {};
+  // The message is the last attribute; the wrapper's unescaping may have put quotes in it.
+  return code + " " + attribute("statusSeverity", {u"\""}) + ": " +
+         attribute("statusMessage", {u"\">", u"\" />", u"\"/>"});
+}
+
+// A record's identity in one line, read through its members by name.
+std::string identity(Object& record) {
+  std::string text;
+  for (const TextView name : {u"ListID", u"FullName", u"EditSequence"}) {
+    const ClassInfo& info = record.classInfo();
+    TextView member = name;
+    if (name == u"FullName" && info.findMember(name) < 0) member = u"Name";
+    if (info.findMember(member) < 0) continue;
+    text += (text.empty() ? "" : ", ") + toUtf8(Text(member)) + " " +
+            toUtf8(record.get(member).toText());
+  }
+  return text;
+}
+
+enum class Outcome { Succeeded, RefusedAsExpected, Unexpected };
+
+// What the demo prints: by default one line a step and a summary; verbose, every request,
+// response and record dump as well.
+class Report {
+ public:
+  Report(Io io, bool verbose) : io_(io), verbose_(verbose) {}
+
+  std::ostream& out() { return io_.out; }
+  bool verbose() const { return verbose_; }
+
+  // Sends one request; verbose, prints it with the answer and, where the stand-in's schema
+  // check refused it, what lint finds in it.
+  Text send(Session& session, const std::string& title, const Text& request) {
+    if (verbose_) {
+      io_.out << kRule << '\n'
+              << title << "\n"
+              << kRule << "\nRequest:\n"
+              << toUtf8(request) << "\n\n";
     }
-    io.out << '\n';
+    const Text response = session.send(request);
+    if (!verbose_) return response;
+    io_.out << "Response status: " << statusText(session.status()) << "\nResponse:\n"
+            << toUtf8(response) << (response.empty() || response.back() != u'\n' ? "\n" : "")
+            << '\n';
+    if (session.status() == RSParsingError) {
+      io_.out << "QuickBooks refused the document. What lint finds in it:\n";
+      for (const auto& problem : simulator::readRequest(toUtf8(request)).problems) {
+        io_.out << "  line " << problem.line << ": " << problem.element << ": " << problem.message
+                << '\n';
+      }
+      io_.out << '\n';
+    }
+    return response;
   }
-  return response;
-}
 
-Text exchange(Io io, Session& session, const std::string& title, const QueryOptions& query) {
-  return exchange(io, session, title, buildQuery(query));
-}
-
-// Adds a customer or job through the builder, checks the answer with IsSuccessRs and reads
-// the added record back from the add response.
-bool addAndReadBack(Io io, Session& session, const Ref<DroCustomer>& customer, bool job) {
-  DroXmlBuilder& builder = *session.facade().XML();
-  if (job) {
-    builder.BuildAddJob(customer);
-  } else {
-    builder.BuildAddCustomer(customer);
+  // A record's dump, verbose only.
+  void dump(const std::string& label, const std::function<Text()>& printOut) {
+    if (!verbose_) return;
+    try {
+      io_.out << label << ":\n" << toUtf8(printOut()) << "\n\n";
+    } catch (const ComError& error) {
+      io_.out << label << " raised error " << error.number() << " (" << toUtf8(error.description())
+              << ")\n\n";
+    }
   }
-  const Text response =
-      exchange(io, session,
-               (job ? "Add a job: BuildAddJob " : "Add a customer: BuildAddCustomer ") +
-                   toUtf8(customer->Name()),
-               builder.XML());
-  if (!builder.IsSuccessRs(response, customer->RequestID())) return false;
-  customer->ParseRs(response);
-  io.out << "Read back with ParseRs, PrintOut:\n" << toUtf8(customer->PrintOut()) << "\n\n";
-  return true;
+
+  // The step's line: its outcome, title, status and what was read back.
+  void step(Outcome outcome, const std::string& title, const std::string& result) {
+    ++steps_;
+    const char* mark = "ok      ";
+    if (outcome == Outcome::RefusedAsExpected) {
+      mark = "refused ";
+      ++refused_;
+    } else if (outcome == Outcome::Unexpected) {
+      mark = "FAILED  ";
+      ++unexpected_;
+    }
+    io_.out << mark << title << ": " << result << (verbose_ ? "\n\n" : "\n");
+  }
+
+  void summary(const std::string& company) {
+    io_.out << "\n"
+            << steps_ << " steps on " << company << ": " << steps_ - refused_ - unexpected_
+            << " answered with success, " << refused_ << " refused as expected, " << unexpected_
+            << " unexpected.\n";
+  }
+  bool allAsExpected() const { return unexpected_ == 0; }
+
+ private:
+  Io io_;
+  bool verbose_;
+  int steps_ = 0;
+  int refused_ = 0;
+  int unexpected_ = 0;
+};
+
+std::string statusLine(Session& session, const Text& response) {
+  const std::string quickBooks = quickBooksStatus(response);
+  return statusText(session.status()) + (quickBooks.empty() ? "" : " (" + quickBooks + ")");
 }
 
-// Adds one account or item through `build`, checks the answer with IsSuccessRs and reads the
-// record back from its add response. A request the schema is known to refuse counts as
-// shown when QuickBooks refuses it with its parse error.
+void query(Report& report, Session& session, const std::string& title, const QueryOptions& options,
+           const std::string& retTag) {
+  const Text response = report.send(session, title, buildQuery(options));
+  const bool ok = session.status() == RSSuccess || session.status() == RSNoMatch;
+  report.step(ok ? Outcome::Succeeded : Outcome::Unexpected, title,
+              statusLine(session, response) + "; " + std::to_string(countOf(response, retTag)) +
+                  " " + retTag);
+}
+
+// Sends what `build` writes for one list record (a customer, job, account or item), checks
+// the answer with IsSuccessRs and reads the record back from its add response. A request
+// the schema is known to refuse counts when QuickBooks refuses it with its parse error.
 template <class Record>
-bool addListRecord(Io io, Session& session, const std::string& title, const Ref<Record>& record,
-                   const std::function<void(DroXmlBuilder&)>& build, bool refusedBySchema = false) {
+void addListRecord(Report& report, Session& session, const std::string& title,
+                   const Ref<Record>& record, const std::function<void(DroXmlBuilder&)>& build,
+                   bool refusedBySchema = false) {
   DroXmlBuilder& builder = *session.facade().XML();
   build(builder);
-  const Text response = exchange(io, session, title, builder.XML());
+  const Text response = report.send(session, title, builder.XML());
   if (refusedBySchema) {
-    io.out << (session.status() == RSParsingError
-                   ? "As expected: QuickBooks' schema refuses this request as the component "
-                     "writes it (see the README).\n\n"
-                   : "Unexpected: this request was meant to be refused by QuickBooks' schema.\n\n");
-    return true;
+    const bool refused = session.status() == RSParsingError;
+    report.step(refused ? Outcome::RefusedAsExpected : Outcome::Unexpected, title,
+                statusLine(session, response) +
+                    (refused ? "; QuickBooks' schema refuses it as the component writes it "
+                               "(see the README)"
+                             : "; this request was meant to be refused by the schema"));
+    return;
   }
-  if (!builder.IsSuccessRs(response, record->RequestID())) return false;
+  if (!builder.IsSuccessRs(response, record->RequestID())) {
+    report.step(Outcome::Unexpected, title, statusLine(session, response));
+    return;
+  }
   record->ParseRs(response);
-  io.out << "Read back with ParseRs, PrintOut:\n" << toUtf8(record->PrintOut()) << "\n\n";
-  return true;
+  report.step(Outcome::Succeeded, title,
+              statusLine(session, response) + "; read back " + identity(*record));
+  report.dump("Read back with ParseRs, PrintOut", [&] { return record->PrintOut(); });
 }
 
 // The account and one item of every kind the builder writes, named after this run.
-bool addAccountAndItems(Io io, Session& session, const Text& run) {
-  bool added = true;
-  const auto addItem = [&](const std::string& title, udItemType kind, const auto& item,
+struct Items {
+  Ref<DroItemInventory> tile;
+  Ref<DroItemNonInventory> grout;
+  Ref<DroItemSubtotal> subtotal;
+  Ref<DroItemDiscount> discount;
+  Ref<DroItemService> labour;
+};
+
+Items addAccountAndItems(Report& report, Session& session, const Text& run) {
+  const auto addItem = [&](const std::string& kindName, udItemType kind, const auto& item,
                            bool refused = false) {
-    added = addListRecord(
-                io, session, "Add an item: BuildAddItem " + title, item,
-                [&](DroXmlBuilder& b) { b.BuildAddItem(kind, Variant(item)); }, refused) &&
-            added;
+    addListRecord(
+        report, session, "BuildAddItem " + kindName + " \"" + toUtf8(item->Name()) + "\"", item,
+        [&](DroXmlBuilder& b) { b.BuildAddItem(kind, Variant(item)); }, refused);
   };
 
   auto account = std::make_shared<DroAccount>();
@@ -114,10 +233,11 @@ bool addAccountAndItems(Io io, Session& session, const Text& run) {
   account->AccountType(u"Expense");
   account->AccountNumber(u"6" + run);
   account->Desc(u"Materials bought for jobs, by job");  // cut to 29 characters
-  added = addListRecord(io, session, "Add an account: BuildAddAccount " + toUtf8(account->Name()),
-                        account, [&](DroXmlBuilder& b) { b.BuildAddAccount(account); });
+  addListRecord(report, session, "BuildAddAccount \"" + toUtf8(account->Name()) + "\"", account,
+                [&](DroXmlBuilder& b) { b.BuildAddAccount(account); });
 
-  auto tile = std::make_shared<DroItemInventory>();
+  Items items;
+  auto& tile = items.tile = std::make_shared<DroItemInventory>();
   tile->Name(u"Floor Tile " + run);
   tile->SalesTaxCodeRef()->FullName(u"TAX");
   tile->SalesDesc(u"Porcelain floor tile, per box");
@@ -129,7 +249,7 @@ bool addAccountAndItems(Io io, Session& session, const Text& run) {
   tile->ReorderPoint(u"20");
   addItem("udItemInventory", udItemInventory, tile);
 
-  auto grout = std::make_shared<DroItemNonInventory>();
+  auto& grout = items.grout = std::make_shared<DroItemNonInventory>();
   grout->Name(u"Grout " + run);
   grout->SalesTaxCodeRef()->FullName(u"TAX");
   grout->SalesOrPurchase()->Desc(u"Sanded grout, 25 lb");
@@ -137,12 +257,12 @@ bool addAccountAndItems(Io io, Session& session, const Text& run) {
   grout->SalesOrPurchase()->AccountRef()->FullName(u"Sales");
   addItem("udItemNonInventory", udItemNonInventory, grout);
 
-  auto subtotal = std::make_shared<DroItemSubtotal>();
+  auto& subtotal = items.subtotal = std::make_shared<DroItemSubtotal>();
   subtotal->Name(u"Materials Subtotal " + run);
   subtotal->ItemDesc(u"Materials subtotal");
   addItem("udItemSubtotal", udItemSubtotal, subtotal);
 
-  auto discount = std::make_shared<DroItemDiscount>();
+  auto& discount = items.discount = std::make_shared<DroItemDiscount>();
   discount->Name(u"Repeat Client " + run);
   discount->ItemDesc(u"Repeat client discount");
   discount->DiscountRatePercent(u"5.0");
@@ -159,7 +279,7 @@ bool addAccountAndItems(Io io, Session& session, const Text& run) {
   haul->SalesAndPurchase()->ExpenseAccountRef()->FullName(u"Job Expenses");
   addItem("udItemOtherCharge", udItemOtherCharge, haul);
 
-  auto labour = std::make_shared<DroItemService>();
+  auto& labour = items.labour = std::make_shared<DroItemService>();
   labour->Name(u"Tiling Labour " + run);
   labour->SalesTaxCodeRef()->FullName(u"NON");
   labour->SalesAndPurchase()->SalesDesc(u"Tiling, per hour");
@@ -186,119 +306,290 @@ bool addAccountAndItems(Io io, Session& session, const Text& run) {
   const auto line = kit->ItemGroupLines()->Add();
   line->ItemRef()->FullName(tile->Name());
   line->Quantity(u"4");
-  addItem("udItemGroup (refused)", udItemGroup, kit, true);
+  addItem("udItemGroup", udItemGroup, kit, true);
 
   auto consultation = std::make_shared<DroItemService>();
   consultation->Name(u"Consultation " + run);
   consultation->SalesOrPurchase()->Price(u"80");
   consultation->SalesOrPurchase()->AccountRef()->FullName(u"Sales");
-  addItem("udItemService with SalesOrPurchase (refused)", udItemService, consultation, true);
+  addItem("udItemService with SalesOrPurchase", udItemService, consultation, true);
 
   auto check = std::make_shared<DroItemPayment>();
   check->Name(u"Check " + run);
   check->ItemDesc(u"Payment by check");
-  addItem("udItemPayment with a description (refused)", udItemPayment, check, true);
+  addItem("udItemPayment with a description", udItemPayment, check, true);
 
   auto taxes = std::make_shared<DroItemSalesTaxGroup>();
   taxes->Name(u"State and City " + run);
   taxes->ItemDesc(u"A group holds no members the component can send");
-  addItem("udItemSalesTaxGroup (refused)", udItemSalesTaxGroup, taxes, true);
-  return added;
+  addItem("udItemSalesTaxGroup", udItemSalesTaxGroup, taxes, true);
+  return items;
+}
+
+// An item group QuickBooks accepts, as qbXML written here: the component's group builder
+// writes a request the schema refuses.
+Text itemGroupRequest(const Text& name, const Items& items) {
+  DroXmlBuilder escaper;
+  const auto line = [&](const Text& item, const char* quantity) {
+    return u"<ItemGroupLine><ItemRef><FullName>" + escaper.XmlEscapeX(item) +
+           u"</FullName></ItemRef><Quantity>" + fromUtf8(quantity) + u"</Quantity></ItemGroupLine>";
+  };
+  return u"<?xml version=\"1.0\"?>\r\n<?qbxml version=\"13.0\"?>\r\n<QBXML><QBXMLMsgsRq "
+         u"onError=\"stopOnError\"><ItemGroupAddRq requestID=\"2\"><ItemGroupAdd><Name>" +
+         escaper.XmlEscapeX(name) + u"</Name><ItemDesc>Tiling set</ItemDesc>" +
+         line(items.tile->Name(), "10") + line(items.grout->Name(), "1") +
+         line(items.labour->Name(), "4") +
+         u"</ItemGroupAdd></ItemGroupAddRq></QBXMLMsgsRq></QBXML>";
+}
+
+// The lines every transaction of the demo holds: tile, grout, a subtotal and a discount,
+// then one line group of the tiling set.
+template <class Lines, class Groups>
+void fillLines(Lines& lines, Groups& groups, const Items& items, const Text& set) {
+  const auto tile = lines.Add(items.tile->Name());
+  tile->ItemRef()->FullName(items.tile->Name());
+  tile->ItemType(udItemInventory);
+  tile->Quantity(u"12");
+  tile->Rate(u"42.50");
+  const auto grout = lines.Add(items.grout->Name());
+  grout->ItemRef()->FullName(items.grout->Name());
+  grout->ItemType(udItemNonInventory);
+  grout->Quantity(u"2");
+  const auto subtotal = lines.Add(items.subtotal->Name());
+  subtotal->ItemRef()->FullName(items.subtotal->Name());
+  subtotal->ItemType(udItemSubtotal);
+  const auto discount = lines.Add(items.discount->Name());
+  discount->ItemRef()->FullName(items.discount->Name());
+  discount->ItemType(udItemDiscount);
+  const auto group = groups.Add(set);
+  group->ItemGroupRef()->FullName(set);
+  group->Quantity(u"1");
+}
+
+// What QuickBooks answered for a transaction, and what the record read of it.
+std::string txnResult(Session& session, const Text& response, const std::string& retTag,
+                      const std::string& total, const Text& txnIdRead) {
+  std::string text = statusLine(session, response) + "; QuickBooks: TxnID " +
+                     firstValue(response, "TxnID") + ", Subtotal " +
+                     firstValue(response, "Subtotal") + ", SalesTaxTotal " +
+                     firstValue(response, "SalesTaxTotal") + ", " + total + " " +
+                     firstValue(response, total) + "; ParseRs read ";
+  if (!txnIdRead.empty()) return text + "TxnID " + toUtf8(txnIdRead);
+  // The records look for the add-response tags the component has always looked for.
+  return text + "nothing: it looks for \"" + retTag.substr(0, retTag.size() - 3) +
+         "AddRet\" and QuickBooks answers with \"" + retTag + "\"";
+}
+
+// An inventory item's quantity on hand, from the list of every inventory item.
+std::string onHand(Report& report, Session& session, const Text& item) {
+  QueryOptions options;
+  options.kind = udEtItemInv;
+  const Text response = report.send(session, "Inventory items", buildQuery(options));
+  const size_t at =
+      response.find(u"<FullName>" + DroXmlBuilder().XmlEscapeX(item) + u"</FullName>");
+  return at == Text::npos ? std::string() : firstValue(response.substr(at), "QuantityOnHand");
+}
+
+void addEstimateAndInvoice(Report& report, Session& session, const Text& run, const Text& customer,
+                           const Items& items) {
+  const Text set = u"Tiling Set " + run;
+  const Text groupResponse =
+      report.send(session, "An item group, as qbXML", itemGroupRequest(set, items));
+  report.step(session.status() == RSSuccess ? Outcome::Succeeded : Outcome::Unexpected,
+              "Item group \"" + toUtf8(set) + "\" sent as qbXML (not the component's builder)",
+              statusLine(session, groupResponse));
+
+  DroXmlBuilder& builder = *session.facade().XML();
+  auto estimate = std::make_shared<DroEstimate>();
+  estimate->CustomerRef()->FullName(customer);
+  estimate->Memo(u"Bathroom floor, estimate " + run);
+  fillLines(*estimate->EstimateLines(), *estimate->EstimateLineGroups(), items, set);
+  builder.BuildAddEstimate(estimate);
+  const std::string estimateTitle = "BuildAddEstimate for \"" + toUtf8(customer) + "\"";
+  const Text estimated = report.send(session, estimateTitle, builder.XML());
+  const bool estimateOk = builder.IsSuccessRs(estimated, estimate->RequestID());
+  estimate->ParseRs(estimated);
+  report.step(estimateOk ? Outcome::Succeeded : Outcome::Unexpected, estimateTitle,
+              txnResult(session, estimated, "EstimateRet", "TotalAmount", estimate->TxnID()));
+  // An estimate holding a line group cannot be dumped: PrintOut raises 13.
+  report.dump("PrintOut", [&] { return estimate->PrintOut(); });
+
+  const std::string before = onHand(report, session, items.tile->Name());
+  auto invoice = std::make_shared<DroInvoice>();
+  invoice->CustomerRef()->FullName(customer);
+  invoice->PONumber(u"PO-" + run);
+  fillLines(*invoice->InvoiceLines(), *invoice->InvoiceLineGroups(), items, set);
+  invoice->InvoiceLines()->Item(Variant(items.tile->Name()))->ServiceDate(u"2026-11-20");
+  builder.BuildAddInvoice(invoice);
+  const std::string invoiceTitle = "BuildAddInvoice for \"" + toUtf8(customer) + "\"";
+  const Text invoiced = report.send(session, invoiceTitle, builder.XML());
+  const bool invoiceOk = builder.IsSuccessRs(invoiced, invoice->RequestID());
+  invoice->ParseRs(invoiced);
+  report.step(invoiceOk ? Outcome::Succeeded : Outcome::Unexpected, invoiceTitle,
+              txnResult(session, invoiced, "InvoiceRet", "BalanceRemaining", invoice->TxnID()));
+  report.dump("The line group's PrintOut",
+              [&] { return invoice->InvoiceLineGroups()->Item(Variant(1))->PrintOut(); });
+  const std::string after = onHand(report, session, items.tile->Name());
+  report.step(before != after ? Outcome::Succeeded : Outcome::Unexpected,
+              "Quantity on hand of \"" + toUtf8(items.tile->Name()) + "\"",
+              before + " before the invoice, " + after + " after (12 sold, 10 more in the set)");
+}
+
+// With sales tax off, QuickBooks refuses a line tax code: the wrapper reports it with its own
+// status for each transaction kind.
+void taxCodeOutcome(Io io, Report& report, const ConnectionOptions& options) {
+  report.out() << "\nA company file with sales tax off: " << options.company << '\n';
+  Session session(io, options);
+  if (!session.open()) {
+    report.step(Outcome::Unexpected, "Session on the company without sales tax", "no session");
+    return;
+  }
+  DroXmlBuilder& builder = *session.facade().XML();
+  auto customer = std::make_shared<DroCustomer>();
+  customer->Name(u"Tax Free Builders");
+  addListRecord(report, session, "BuildAddCustomer \"Tax Free Builders\"", customer,
+                [&](DroXmlBuilder& b) { b.BuildAddCustomer(customer); });
+  auto labour = std::make_shared<DroItemService>();
+  labour->Name(u"Labour");
+  labour->SalesAndPurchase()->SalesPrice(u"65");
+  labour->SalesAndPurchase()->IncomeAccountRef()->FullName(u"Sales");
+  labour->SalesAndPurchase()->ExpenseAccountRef()->FullName(u"Job Expenses");
+  addListRecord(report, session, "BuildAddItem udItemService \"Labour\"", labour,
+                [&](DroXmlBuilder& b) { b.BuildAddItem(udItemService, Variant(labour)); });
+
+  const auto refusedTaxCode = [&](const std::string& title, int32_t expected) {
+    const Text response = report.send(session, title, builder.XML());
+    report.step(session.status() == expected ? Outcome::RefusedAsExpected : Outcome::Unexpected,
+                title, statusLine(session, response));
+  };
+  auto estimate = std::make_shared<DroEstimate>();
+  estimate->CustomerRef()->FullName(customer->Name());
+  const auto estimateLine = estimate->EstimateLines()->Add();
+  estimateLine->ItemRef()->FullName(u"Labour");
+  estimateLine->SalesTaxCodeRef()->FullName(u"NON");
+  builder.BuildAddEstimate(estimate);
+  refusedTaxCode("BuildAddEstimate, a line with tax code NON", RSTaxErrorEstimate);
+  auto invoice = std::make_shared<DroInvoice>();
+  invoice->CustomerRef()->FullName(customer->Name());
+  const auto invoiceLine = invoice->InvoiceLines()->Add();
+  invoiceLine->ItemRef()->FullName(u"Labour");
+  invoiceLine->SalesTaxCodeRef()->FullName(u"NON");
+  builder.BuildAddInvoice(invoice);
+  refusedTaxCode("BuildAddInvoice, a line with tax code NON", RSTaxErrorInvoice);
+  // bTaxable true (it works in reverse of its name) keeps the line tax codes out.
+  builder.BuildAddInvoice(invoice, true);
+  const Text accepted = report.send(session, "BuildAddInvoice with bTaxable true", builder.XML());
+  report.step(session.status() == RSSuccess ? Outcome::Succeeded : Outcome::Unexpected,
+              "BuildAddInvoice with bTaxable true (no line tax codes)",
+              statusLine(session, accepted));
 }
 
 }  // namespace
 
-int demoCommand(Io io, const ConnectionOptions& options) {
+int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
   ConnectionOptions connection = options;
-  std::filesystem::path temporary;
-  if (connection.company.empty()) {
-    temporary = std::filesystem::temp_directory_path() / "droqbxml-demo";
-    std::error_code ignored;
-    std::filesystem::remove_all(temporary, ignored);
-    std::filesystem::create_directories(temporary);
-    connection.company = (temporary / "demo-company.qbw").string();
-  }
-  if (!std::filesystem::exists(connection.company)) {
-    try {
+  std::error_code ignored;
+  const std::filesystem::path temporary = std::filesystem::temp_directory_path() / "droqbxml-demo";
+  std::filesystem::remove_all(temporary, ignored);
+  std::filesystem::create_directories(temporary);
+  if (connection.company.empty()) connection.company = (temporary / "demo-company.qbw").string();
+  ConnectionOptions noTax = connection;
+  noTax.company = (temporary / "no-sales-tax.qbw").string();
+  try {
+    if (!std::filesystem::exists(connection.company)) {
       simulator::CompanyFile::create(connection.company, {"Demo Company", true});
-      io.out << "Created company file " << connection.company << "\n\n";
-    } catch (const simulator::CompanyFileError& error) {
-      io.err << "droqbxml: " << error.what() << '\n';
-      return kExitConnection;
+      io.out << "Created company file " << connection.company << "\n";
+    } else {
+      io.out << "Using company file " << connection.company << "\n";
     }
-  } else {
-    io.out << "Using company file " << connection.company << "\n\n";
+    simulator::CompanyFile::create(noTax.company, {"No Sales Tax Company", false});
+  } catch (const simulator::CompanyFileError& error) {
+    io.err << "droqbxml: " << error.what() << '\n';
+    return kExitConnection;
   }
 
-  int code = kExitSuccess;
+  Report report(io, verbose);
   {
     const ProcessorOverride override(connection.processor);
-    Session session(io, connection);
-    if (!session.open()) return kExitConnection;
-    io.out << "Connected as \"" << toUtf8(session.facade().API()->appName()) << "\" ("
-           << toUtf8(session.facade().API()->appID()) << "), session on "
-           << toUtf8(session.facade().API()->GetCurrentCompanyFileName()) << "\n\n";
-    QueryOptions accounts;
-    accounts.kind = udEtAccount;
-    exchange(io, session, "All accounts (BuildQueryByAll udEtAccount)", accounts);
-    for (const auto& [kind, title] :
-         {std::pair{udEtItemInv, "Inventory items (BuildQueryByAll udEtItemInv)"},
-          std::pair{udEtItemNonInv, "Non-inventory items (BuildQueryByAll udEtItemNonInv)"},
-          std::pair{udEtItemOther, "Other charges (BuildQueryByAll udEtItemOther)"}}) {
-      QueryOptions items;
-      items.kind = kind;
-      exchange(io, session, title, items);
+    {
+      Session session(io, connection);
+      if (!session.open()) return kExitConnection;
+      io.out << "Connected as \"" << toUtf8(session.facade().API()->appName()) << "\" ("
+             << toUtf8(session.facade().API()->appID()) << "), session on "
+             << toUtf8(session.facade().API()->GetCurrentCompanyFileName()) << "\n\n";
+      const auto all = [](int32_t kind) {
+        QueryOptions options;
+        options.kind = kind;
+        return options;
+      };
+      query(report, session, "BuildQueryByAll udEtAccount", all(udEtAccount), "AccountRet");
+      query(report, session, "BuildQueryByAll udEtItemInv", all(udEtItemInv), "ItemInventoryRet");
+      query(report, session, "BuildQueryByAll udEtItemNonInv", all(udEtItemNonInv),
+            "ItemNonInventoryRet");
+      query(report, session, "BuildQueryByAll udEtItemOther", all(udEtItemOther),
+            "ItemOtherChargeRet");
+      const Text existing = report.send(session, "All customers", buildQuery(all(udEtCustomer)));
+      report.step(session.status() == RSSuccess || session.status() == RSNoMatch
+                      ? Outcome::Succeeded
+                      : Outcome::Unexpected,
+                  "BuildQueryByAll udEtCustomer",
+                  statusLine(session, existing) + "; " +
+                      std::to_string(countOf(existing, "CustomerRet")) + " CustomerRet");
+      const Text run = runLabel(existing);
+
+      auto kim = std::make_shared<DroCustomer>();
+      kim->Name(u"Kim Lee " + run);
+      kim->CompanyName(u"Lee & Daughters");
+      kim->FirstName(u"Kim");
+      kim->LastName(u"Lee");
+      kim->BillAddress()->Addr1(u"12 Harbour Road");
+      kim->BillAddress()->City(u"Portsmouth");
+      kim->BillAddress()->State(u"NH");
+      kim->BillAddress()->PostalCode(u"03801");
+      kim->BillAddress()->Country(u"");  // an empty field makes the address count as filled
+      kim->Phone(u"603-555-0142");
+      addListRecord(report, session, "BuildAddCustomer \"" + toUtf8(kim->Name()) + "\"", kim,
+                    [&](DroXmlBuilder& b) { b.BuildAddCustomer(kim); });
+      auto kitchen = std::make_shared<DroCustomer>();
+      kitchen->Name(u"Kitchen remodel");
+      kitchen->ParentRef()->FullName(kim->Name());
+      kitchen->JobStatus(u"InProgress");
+      kitchen->JobDesc(u"New cabinets and counters");
+      addListRecord(report, session, "BuildAddJob \"Kitchen remodel\"", kitchen,
+                    [&](DroXmlBuilder& b) { b.BuildAddJob(kitchen); });
+
+      QueryOptions byName;
+      byName.kind = udEtCustomer;
+      byName.fullName = toUtf8(kitchen->FullName().empty() ? kim->Name() + u":Kitchen remodel"
+                                                           : kitchen->FullName());
+      const Text named = report.send(session, "A job by full name", buildQuery(byName));
+      DroCustomer found;
+      found.ParseRs(named);
+      report.step(found.ListID().empty() ? Outcome::Unexpected : Outcome::Succeeded,
+                  "BuildQueryByFullName \"" + byName.fullName.value() + "\"",
+                  statusLine(session, named) + "; read " + identity(found));
+      report.dump("PrintOut", [&] { return found.PrintOut(); });
+      QueryOptions byId;
+      byId.kind = udEtCustomer;
+      byId.listId = toUtf8(kim->ListID());
+      const Text identified = report.send(session, "A customer by list id", buildQuery(byId));
+      DroCustomer same;
+      same.ParseRs(identified);
+      report.step(same.ListID().empty() ? Outcome::Unexpected : Outcome::Succeeded,
+                  "BuildQueryByListID " + byId.listId.value(),
+                  statusLine(session, identified) + "; read " + identity(same));
+      report.dump("PrintOut", [&] { return same.PrintOut(); });
+
+      const Items items = addAccountAndItems(report, session, run);
+      const Text customer = kitchen->FullName().empty() ? kim->Name() : kitchen->FullName();
+      addEstimateAndInvoice(report, session, run, customer, items);
     }
-    QueryOptions customers;
-    customers.kind = udEtCustomer;
-    const Text existing =
-        exchange(io, session, "All customers (BuildQueryByAll udEtCustomer)", customers);
-
-    auto kim = std::make_shared<DroCustomer>();
-    kim->Name(u"Kim Lee " + runLabel(existing));
-    kim->CompanyName(u"Lee & Daughters");
-    kim->FirstName(u"Kim");
-    kim->LastName(u"Lee");
-    kim->BillAddress()->Addr1(u"12 Harbour Road");
-    kim->BillAddress()->City(u"Portsmouth");
-    kim->BillAddress()->State(u"NH");
-    kim->BillAddress()->PostalCode(u"03801");
-    kim->BillAddress()->Country(u"");  // an empty field makes the address count as filled
-    kim->Phone(u"603-555-0142");
-    bool added = addAndReadBack(io, session, kim, false);
-    auto kitchen = std::make_shared<DroCustomer>();
-    kitchen->Name(u"Kitchen remodel");
-    kitchen->ParentRef()->FullName(kim->Name());
-    kitchen->JobStatus(u"InProgress");
-    kitchen->JobDesc(u"New cabinets and counters");
-    added = addAndReadBack(io, session, kitchen, true) && added;
-
-    QueryOptions byName;
-    byName.kind = udEtCustomer;
-    byName.fullName = toUtf8(kitchen->FullName().empty() ? kim->Name() + u":Kitchen remodel"
-                                                         : kitchen->FullName());
-    const Text named = exchange(io, session, "A job by full name (BuildQueryByFullName)", byName);
-    DroCustomer found;
-    found.ParseRs(named);
-    io.out << "PrintOut:\n" << toUtf8(found.PrintOut()) << "\n\n";
-    QueryOptions byId;
-    byId.kind = udEtCustomer;
-    byId.listId = toUtf8(kim->ListID());
-    const Text identified =
-        exchange(io, session, "A customer by list id (BuildQueryByListID)", byId);
-    DroCustomer same;
-    same.ParseRs(identified);
-    io.out << "PrintOut:\n" << toUtf8(same.PrintOut()) << "\n\n";
-    if (session.status() != RSSuccess) added = false;
-    added = addAccountAndItems(io, session, runLabel(existing)) && added;
-    if (!added) code = kExitNotSuccess;
+    taxCodeOutcome(io, report, noTax);
   }
-  io.out << "Session ended, connection closed.\n";
-  if (!temporary.empty()) {
-    std::error_code ignored;
-    std::filesystem::remove_all(temporary, ignored);
-  }
-  return code;
+  io.out << "Sessions ended, connections closed.\n";
+  report.summary(connection.company);
+  std::filesystem::remove_all(temporary, ignored);
+  return report.allAsExpected() ? kExitSuccess : kExitNotSuccess;
 }
 
 }  // namespace droqbxml::cli
