@@ -15,6 +15,7 @@
 #include <cstdint>
 
 #include "droqbxml/qbxml/Enumerations.hpp"
+#include "droqbxml/records/DroAddress.hpp"
 #include "droqbxml/records/DroObjRef.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
 #include "droqbxml/records/Record.hpp"
@@ -228,14 +229,65 @@ template <TxnKind Kind>
 void readGroups(DroTxnLineGroupCol<Kind>& groups, const Text& Value, int32_t& StartPoint,
                 int32_t& EndPoint);
 
-// What the two header records share: their line and group collections and the reading of
-// an add response (Derived::kFields holds "RequestID").
+// What the two header records share: the references, addresses and texts both have, their
+// line and group collections and the reading of an add response (Derived::kFields holds
+// the shared texts' names).
 template <class Derived, TxnKind Kind>
 class TxnRecordOf : public RecordOf<Derived> {
  public:
   static constexpr const TxnKindSpec& kSpec = kTxnKinds[static_cast<size_t>(Kind)];
   using Reader = FieldReader<Derived>;
 
+  const ObjectProperty<DroCustomerRef>& CustomerRef() const { return customerRef_; }
+  void CustomerRef(Ref<DroCustomerRef> v) { customerRef_ = std::move(v); }
+  const ObjectProperty<DroClassRef>& ClassRef() const { return classRef_; }
+  void ClassRef(Ref<DroClassRef> v) { classRef_ = std::move(v); }
+  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_; }
+  void BillAddress(Ref<DroAddress> v) { billAddress_ = std::move(v); }
+  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_; }
+  void TermsRef(Ref<DroTermsRef> v) { termsRef_ = std::move(v); }
+  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_; }
+  void SalesRepRef(Ref<DroSalesRepRef> v) { salesRepRef_ = std::move(v); }
+  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const { return itemSalesTaxRef_; }
+  void ItemSalesTaxRef(Ref<DroItemSalesTaxRef> v) { itemSalesTaxRef_ = std::move(v); }
+  const ObjectProperty<DroCustomerMsgRef>& CustomerMsgRef() const { return customerMsgRef_; }
+  void CustomerMsgRef(Ref<DroCustomerMsgRef> v) { customerMsgRef_ = std::move(v); }
+  const ObjectProperty<DroCustomerSalesTaxCodeRef>& CustomerSalesTaxCodeRef() const {
+    return customerSalesTaxCodeRef_;
+  }
+  void CustomerSalesTaxCodeRef(Ref<DroCustomerSalesTaxCodeRef> v) {
+    customerSalesTaxCodeRef_ = std::move(v);
+  }
+  const Text& TxnID() const { return this->template field<u"TxnID">(); }
+  void TxnID(const Text& v) { this->template setField<u"TxnID">(v); }
+  const Text& TimeCreated() const { return this->template field<u"TimeCreated">(); }
+  void TimeCreated(const Text& v) { this->template setField<u"TimeCreated">(v); }
+  const Text& TimeModified() const { return this->template field<u"TimeModified">(); }
+  void TimeModified(const Text& v) { this->template setField<u"TimeModified">(v); }
+  const Text& EditSequence() const { return this->template field<u"EditSequence">(); }
+  void EditSequence(const Text& v) { this->template setField<u"EditSequence">(v); }
+  const Text& TxnNumber() const { return this->template field<u"TxnNumber">(); }
+  void TxnNumber(const Text& v) { this->template setField<u"TxnNumber">(v); }
+  const Text& TxnDate() const { return this->template field<u"TxnDate">(); }
+  void TxnDate(const Text& v) { this->template setField<u"TxnDate">(v); }
+  const Text& RefNumber() const { return this->template field<u"RefNumber">(); }
+  void RefNumber(const Text& v) { this->template setField<u"RefNumber">(v); }
+  const Text& PONumber() const { return this->template field<u"PONumber">(); }
+  void PONumber(const Text& v) { this->template setField<u"PONumber">(v); }
+  const Text& DueDate() const { return this->template field<u"DueDate">(); }
+  void DueDate(const Text& v) { this->template setField<u"DueDate">(v); }
+  const Text& FOB() const { return this->template field<u"FOB">(); }
+  void FOB(const Text& v) { this->template setField<u"FOB">(v); }
+  const Text& Subtotal() const { return this->template field<u"Subtotal">(); }
+  void Subtotal(const Text& v) { this->template setField<u"Subtotal">(v); }
+  const Text& SalesTaxPercentage() const { return this->template field<u"SalesTaxPercentage">(); }
+  void SalesTaxPercentage(const Text& v) { this->template setField<u"SalesTaxPercentage">(v); }
+  const Text& SalesTaxTotal() const { return this->template field<u"SalesTaxTotal">(); }
+  void SalesTaxTotal(const Text& v) { this->template setField<u"SalesTaxTotal">(v); }
+  const Text& Memo() const { return this->template field<u"Memo">(); }
+  void Memo(const Text& v) { this->template setField<u"Memo">(v); }
+  const Text& IsToBePrinted() const { return this->template field<u"IsToBePrinted">(); }
+  void IsToBePrinted(const Text& v) { this->template setField<u"IsToBePrinted">(v); }
   const Text& RequestID() const { return this->template field<u"RequestID">(); }
   void RequestID(const Text& v) { this->template setField<u"RequestID">(v); }
 
@@ -249,6 +301,14 @@ class TxnRecordOf : public RecordOf<Derived> {
   template <class Header>
   int32_t parseTxn(const Text& Value, int32_t StartPoint, Header readHeader);
 
+  ObjectProperty<DroCustomerRef> customerRef_;
+  ObjectProperty<DroClassRef> classRef_;
+  ObjectProperty<DroAddress> billAddress_;
+  ObjectProperty<DroTermsRef> termsRef_;
+  ObjectProperty<DroSalesRepRef> salesRepRef_;
+  ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
+  ObjectProperty<DroCustomerMsgRef> customerMsgRef_;
+  ObjectProperty<DroCustomerSalesTaxCodeRef> customerSalesTaxCodeRef_;
   ObjectProperty<DroTxnLineCol<Kind>> lines_;
   ObjectProperty<DroTxnLineGroupCol<Kind>> groups_;
 };
