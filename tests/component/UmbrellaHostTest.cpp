@@ -35,6 +35,16 @@ TEST(UmbrellaHostTest, EveryPublicClassIsDeclared) {
   DroClassRef classRef;
   DroAddress address;
   DroXmlElement element;
+  DroEstimate estimate;
+  DroEstimateLine estimateLine;
+  DroEstimateLineCol estimateLines;
+  DroEstimateLineGroup estimateGroup;
+  DroEstimateLineGroupCol estimateGroups;
+  DroInvoice invoice;
+  DroInvoiceLine invoiceLine;
+  DroInvoiceLineCol invoiceLines;
+  DroInvoiceLineGroup invoiceGroup;
+  DroInvoiceLineGroupCol invoiceGroups;
   clsXmlStringEscaping escaping;
   clsAppPathAccess path;
   clsTrace trace;
