@@ -12,6 +12,7 @@
 #include <utility>
 #include <vector>
 
+#include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/connection/DroXmlSdkWrapper.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
 #include "simulator/CompanyFile.hpp"
@@ -319,6 +320,43 @@ TEST_F(SimulatedProcessorTest, TheSessionWrapperUnderstandsItsMessages) {
   other.ConnectionClose();
 
   EXPECT_TRUE(DroXmlSdkWrapper().TestForSdkComms(file("a.qbw")));
+}
+
+// On a company file without sales tax, a line's tax code is refused with the message the
+// wrapper tells apart for invoices and estimates.
+TEST_F(SimulatedProcessorTest, TheSessionWrapperTellsTaxCodeRefusalsApart) {
+  const RegistrationGuard guard;
+  install();
+  test::TemporaryDrive drive;  // for the wrapper's log of failed exchanges
+  basGlobals::DroPathAccess(Variant(u"C:\\Tessaly"));
+  const auto document = [](const Text& requests) {
+    return u"<?xml version=\"1.0\" ?>\n<?qbxml version=\"13.0\"?>\n<QBXML>\n<QBXMLMsgsRq "
+           u"onError=\"stopOnError\">\n" +
+           requests + u"</QBXMLMsgsRq>\n</QBXML>\n";
+  };
+  const auto add = [&](const Text& kind) {
+    return document(u"<" + kind + u"AddRq><" + kind +
+                    u"Add><CustomerRef><FullName>Acme</FullName></CustomerRef><" + kind +
+                    u"LineAdd><ItemRef><FullName>Labor</FullName></ItemRef><Quantity>1</Quantity>"
+                    u"<SalesTaxCodeRef><FullName>NON</FullName></SalesTaxCodeRef></" +
+                    kind + u"LineAdd></" + kind + u"Add></" + kind + u"AddRq>\n");
+  };
+  DroXmlSdkWrapper wrapper;
+  wrapper.CompanyFilePath(file("b.qbw"));
+  wrapper.SessionBegin();
+  wrapper.ProcessRequest(document(
+      u"<CustomerAddRq><CustomerAdd><Name>Acme</Name></CustomerAdd></CustomerAddRq>\n"
+      u"<ItemServiceAddRq><ItemServiceAdd><Name>Labor</Name><SalesOrPurchase><Price>85</Price>"
+      u"<AccountRef><FullName>Sales</FullName></AccountRef></SalesOrPurchase></ItemServiceAdd>"
+      u"</ItemServiceAddRq>\n"));
+  EXPECT_EQ(wrapper.ResponseStatus(), RSSuccess);
+  wrapper.ProcessRequest(add(u"Invoice"));
+  EXPECT_EQ(wrapper.ResponseStatus(), RSTaxErrorInvoice);
+  wrapper.ProcessRequest(add(u"Estimate"));
+  EXPECT_EQ(wrapper.ResponseStatus(), RSTaxErrorEstimate);
+  wrapper.SessionEnd();
+  wrapper.ConnectionClose();
+  basGlobals::DroPathAccess(Variant(u""));
 }
 
 }  // namespace
