@@ -1,6 +1,6 @@
 # The two commands a new machine needs: `make test` and `make demo`. Both install any
 # missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
-.PHONY: all setup test bench demo format clean
+.PHONY: all setup test bench demo com com-test format clean
 
 all: test
 
@@ -21,6 +21,17 @@ bench: setup
 	cmake --preset release
 	cmake --build --preset release
 	./build/release/bench/droqbxml_bench
+
+# The component as a Windows COM server (build/windows/DroQbXml.dll), cross-compiled with
+# mingw-w64; com-test drives it with VBScript and JScript under Wine.
+com:
+	@bash scripts/setup-deps.sh com
+	cmake -S com -B build/windows -G Ninja -DCMAKE_TOOLCHAIN_FILE=$(CURDIR)/cmake/mingw-w64.cmake \
+	  -DCMAKE_BUILD_TYPE=Release
+	cmake --build build/windows
+
+com-test: com
+	bash scripts/com-tests.sh
 
 demo: setup
 	cmake --preset release

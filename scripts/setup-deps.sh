@@ -1,10 +1,14 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that building, testing and benchmarking need and that this
 # machine lacks. Shared by the Makefile and .ci/run; does nothing when all are present.
+# `setup-deps.sh com` adds what the Windows COM server and its Wine tests need.
 set -euo pipefail
 
 packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev
   libsqlite3-dev libexpat1-dev libxml2-utils libpugixml-dev)
+if [ "${1:-}" = com ]; then
+  packages+=(wine wine64 g++-mingw-w64-x86-64 mingw-w64-tools libwine-dev)
+fi
 
 missing=()
 for p in "${packages[@]}"; do

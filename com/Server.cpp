@@ -1,0 +1,174 @@
+// The in-process server's entry points: a class factory for every public class, created by
+// ProgID through the component's own class factory, and the registration of those classes.
+// CLSIDs are derived from the ProgIDs, so they stay the same from build to build.
+#include <objbase.h>
+#include <olectl.h>
+#include <windows.h>
+
+#include <array>
+#include <cstdint>
+#include <exception>
+#include <string>
+#include <vector>
+
+#include "com/Dispatch.hpp"
+#include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/runtime/ComError.hpp"
+
+namespace droqbxml::com {
+namespace {
+
+HMODULE thisModule = nullptr;
+
+// A CLSID for a ProgID: two 64-bit FNV-1a hashes of the name under different offsets, marked
+// as a name-based GUID (version 5 bits, RFC 4122 variant).
+CLSID clsidOf(const Text& progId) {
+  const auto hash = [&](uint64_t value) {
+    for (const char16_t unit : progId) {
+      value ^= static_cast<uint64_t>(unit);
+      value *= 1099511628211ULL;
+    }
+    return value;
+  };
+  const uint64_t high = hash(14695981039346656037ULL);
+  const uint64_t low = hash(0x6a09e667f3bcc909ULL);
+  CLSID id;
+  id.Data1 = static_cast<unsigned long>(high >> 32);
+  id.Data2 = static_cast<unsigned short>(high >> 16);
+  id.Data3 = static_cast<unsigned short>((high & 0x0FFF) | 0x5000);
+  for (int i = 0; i < 8; ++i) id.Data4[i] = static_cast<unsigned char>(low >> (56 - 8 * i));
+  id.Data4[0] = static_cast<unsigned char>((id.Data4[0] & 0x3F) | 0x80);
+  return id;
+}
+
+std::wstring wide(const Text& text) { return std::wstring(text.begin(), text.end()); }
+
+std::wstring clsidText(const CLSID& id) {
+  std::array<wchar_t, 40> text{};
+  StringFromGUID2(id, text.data(), static_cast<int>(text.size()));
+  return text.data();
+}
+
+class Factory final : public IClassFactory {
+ public:
+  explicit Factory(Text progId) : progId_(std::move(progId)) { ++liveObjects(); }
+  ~Factory() { --liveObjects(); }
+
+  HRESULT STDMETHODCALLTYPE QueryInterface(REFIID iid, void** out) override {
+    if (out == nullptr) return E_POINTER;
+    if (IsEqualIID(iid, IID_IUnknown) || IsEqualIID(iid, IID_IClassFactory)) {
+      *out = static_cast<IClassFactory*>(this);
+      AddRef();
+      return S_OK;
+    }
+    *out = nullptr;
+    return E_NOINTERFACE;
+  }
+  ULONG STDMETHODCALLTYPE AddRef() override { return ++references_; }
+  ULONG STDMETHODCALLTYPE Release() override {
+    const ULONG left = --references_;
+    if (left == 0) delete this;
+    return left;
+  }
+  HRESULT STDMETHODCALLTYPE CreateInstance(IUnknown* outer, REFIID iid, void** out) override {
+    if (out == nullptr) return E_POINTER;
+    *out = nullptr;
+    if (outer != nullptr) return CLASS_E_NOAGGREGATION;
+    try {
+      IDispatch* object = dispatchFor(CreateObject(progId_));
+      const HRESULT result = object->QueryInterface(iid, out);
+      object->Release();
+      return result;
+    } catch (const ComError& error) {
+      return error.number() < 0 ? static_cast<HRESULT>(error.number()) : E_FAIL;
+    } catch (const std::exception&) {
+      return E_OUTOFMEMORY;
+    }
+  }
+  HRESULT STDMETHODCALLTYPE LockServer(BOOL lock) override {
+    if (lock) {
+      ++serverLocks();
+    } else {
+      --serverLocks();
+    }
+    return S_OK;
+  }
+
+ private:
+  Text progId_;
+  std::atomic<ULONG> references_{1};
+};
+
+bool setValue(HKEY root, const std::wstring& key, const wchar_t* name, const std::wstring& value) {
+  HKEY handle = nullptr;
+  if (RegCreateKeyExW(root, key.c_str(), 0, nullptr, 0, KEY_WRITE, nullptr, &handle, nullptr) !=
+      ERROR_SUCCESS) {
+    return false;
+  }
+  const auto bytes = static_cast<DWORD>((value.size() + 1) * sizeof(wchar_t));
+  const bool ok =
+      RegSetValueExW(handle, name, 0, REG_SZ, reinterpret_cast<const BYTE*>(value.c_str()),
+                     bytes) == ERROR_SUCCESS;
+  RegCloseKey(handle);
+  return ok;
+}
+
+}  // namespace
+}  // namespace droqbxml::com
+
+using droqbxml::Text;
+using namespace droqbxml::com;
+
+extern "C" BOOL WINAPI DllMain(HINSTANCE instance, DWORD reason, LPVOID) {
+  if (reason == DLL_PROCESS_ATTACH) {
+    thisModule = instance;
+    DisableThreadLibraryCalls(instance);
+  }
+  return TRUE;
+}
+
+extern "C" HRESULT STDAPICALLTYPE DllGetClassObject(REFCLSID clsid, REFIID iid, void** out) {
+  if (out == nullptr) return E_POINTER;
+  *out = nullptr;
+  for (const Text& progId : droqbxml::RegisteredProgIds()) {
+    if (!IsEqualCLSID(clsid, clsidOf(progId))) continue;
+    auto* factory = new (std::nothrow) Factory(progId);
+    if (factory == nullptr) return E_OUTOFMEMORY;
+    const HRESULT result = factory->QueryInterface(iid, out);
+    factory->Release();
+    return result;
+  }
+  return CLASS_E_CLASSNOTAVAILABLE;
+}
+
+extern "C" HRESULT STDAPICALLTYPE DllCanUnloadNow() {
+  return liveObjects() == 0 && serverLocks() == 0 ? S_OK : S_FALSE;
+}
+
+extern "C" HRESULT STDAPICALLTYPE DllRegisterServer() {
+  std::array<wchar_t, MAX_PATH> path{};
+  GetModuleFileNameW(thisModule, path.data(), static_cast<DWORD>(path.size()));
+  for (const Text& progId : droqbxml::RegisteredProgIds()) {
+    const std::wstring id = clsidText(clsidOf(progId));
+    const std::wstring name = wide(progId);
+    const std::wstring clsidKey = L"CLSID\\" + id;
+    const bool ok =
+        setValue(HKEY_CLASSES_ROOT, name, nullptr, name) &&
+        setValue(HKEY_CLASSES_ROOT, name + L"\\CLSID", nullptr, id) &&
+        setValue(HKEY_CLASSES_ROOT, clsidKey, nullptr, name) &&
+        setValue(HKEY_CLASSES_ROOT, clsidKey + L"\\ProgID", nullptr, name) &&
+        setValue(HKEY_CLASSES_ROOT, clsidKey + L"\\InprocServer32", nullptr, path.data()) &&
+        setValue(HKEY_CLASSES_ROOT, clsidKey + L"\\InprocServer32", L"ThreadingModel",
+                 L"Apartment");
+    if (!ok) return SELFREG_E_CLASS;
+  }
+  return S_OK;
+}
+
+extern "C" HRESULT STDAPICALLTYPE DllUnregisterServer() {
+  for (const Text& progId : droqbxml::RegisteredProgIds()) {
+    RegDeleteTreeW(HKEY_CLASSES_ROOT, wide(progId).c_str());
+    RegDeleteTreeW(HKEY_CLASSES_ROOT, (L"CLSID\\" + clsidText(clsidOf(progId))).c_str());
+  }
+  return S_OK;
+}
