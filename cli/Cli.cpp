@@ -166,6 +166,11 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
   bool verbose = false;
   demo->add_flag("--verbose,-v", verbose, "Print every request, response and record dump");
 
+  int port = 7371;
+  auto* relay = app.add_subcommand(
+      "relay", "Serve the request processor to Windows programs under Wine (see com/relay)");
+  relay->add_option("--port", port, "Loopback port to listen on")->capture_default_str();
+
   try {
     app.parse(argc, argv);
     for (const QueryOptions* q : {&query, &built}) {
@@ -192,6 +197,7 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
     if (deny->parsed()) return companyDenyCommand(io, company);
     if (lint->parsed()) return lintCommand(io, file);
     if (demo->parsed()) return demoCommand(io, connection, verbose);
+    if (relay->parsed()) return relayCommand(io, port, connection);
   } catch (const ComError& error) {
     err << "droqbxml: " << error.what() << " (error " << error.number() << ", "
         << toUtf8(error.source()) << ")\n";

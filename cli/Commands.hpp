@@ -99,6 +99,9 @@ int companyShowCommand(Io io, const CompanyOptions& options);
 int companyAllowCommand(Io io, const CompanyOptions& options);
 int companyDenyCommand(Io io, const CompanyOptions& options);
 int lintCommand(Io io, const std::string& file);
+// Serves request processor calls relayed from the Windows side on 127.0.0.1:port; runs until
+// stopped.
+int relayCommand(Io io, int port, const ConnectionOptions& connection);
 int demoCommand(Io io, const ConnectionOptions& connection, bool verbose = false);
 
 // Reads a request document from a file, or from the input stream for "-"; reports an

@@ -14,10 +14,16 @@ function caught(body) {
 }
 
 var builder = new ActiveXObject("DroQbXml.DroXmlBuilder");
-var err = new ActiveXObject("DroQbXml.clsMyErr");
-var e = caught(function () { err.Raise(undefined, 0x80044E22 | 0, "DroXmlProcessor.AddHeaders", "Headers"); });
+builder.BuildQueryByAll(0);  // a finished document: headers cannot be added now
+var e = caught(function () { builder.AddHeaders(); });
 check("component number", e && hex(e.number), "80044E22");
-check("component text", e && e.description, "Headers");
+check("component text", e && e.description,
+      "Could not assign XML header information because the DroXmlProcessor object has not " +
+      "been initialized properly prior to attempted use.");
+var err = new ActiveXObject("DroQbXml.clsMyErr");
+e = caught(function () { err.Raise(undefined, 0x80044E34 | 0, "Host.Script", "parse"); });
+check("raised through the error object", e && hex(e.number) + " " + e.description,
+      "80044E34 parse");
 e = caught(function () { new ActiveXObject("DroQbXml.DroEstimate").EstimateLines.Item(7); });
 check("runtime 5", e && hex(e.number), "800A0005");
 e = caught(function () { builder.NoSuchMember(); });
