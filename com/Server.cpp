@@ -49,10 +49,11 @@ std::wstring clsidText(const CLSID& id) {
   return text.data();
 }
 
+// Class factories are not counted among the live objects: COM may keep one cached, and only
+// LockServer holds the server.
 class Factory final : public IClassFactory {
  public:
-  explicit Factory(Text progId) : progId_(std::move(progId)) { ++liveObjects(); }
-  ~Factory() { --liveObjects(); }
+  explicit Factory(Text progId) : progId_(std::move(progId)) {}
 
   HRESULT STDMETHODCALLTYPE QueryInterface(REFIID iid, void** out) override {
     if (out == nullptr) return E_POINTER;
@@ -123,6 +124,21 @@ extern "C" BOOL WINAPI DllMain(HINSTANCE instance, DWORD reason, LPVOID) {
   if (reason == DLL_PROCESS_ATTACH) {
     thisModule = instance;
     DisableThreadLibraryCalls(instance);
+  }
+  // For the tests: how many objects were still alive when the server was unloaded.
+  if (reason == DLL_PROCESS_DETACH) {
+    std::array<wchar_t, MAX_PATH> file{};
+    if (GetEnvironmentVariableW(L"DROQBXML_COM_LIVE_FILE", file.data(),
+                                static_cast<DWORD>(file.size())) > 0) {
+      const HANDLE out = CreateFileW(file.data(), GENERIC_WRITE, 0, nullptr, CREATE_ALWAYS,
+                                     FILE_ATTRIBUTE_NORMAL, nullptr);
+      if (out != INVALID_HANDLE_VALUE) {
+        const std::string count = std::to_string(liveObjects().load());
+        DWORD written = 0;
+        WriteFile(out, count.data(), static_cast<DWORD>(count.size()), &written, nullptr);
+        CloseHandle(out);
+      }
+    }
   }
   return TRUE;
 }

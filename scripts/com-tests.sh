@@ -16,12 +16,39 @@ rm -rf /tmp/droqbxml-com && mkdir -p /tmp/droqbxml-com
 
 failed=()
 count=0
+live="$(dirname "$WINEPREFIX")/live.txt"
 for script in "$root"/tests/com/*.vbs "$root"/tests/com/*.js; do
   [ -f "$script" ] || continue
   count=$((count + 1))
   echo "== ${script#$root/}"
-  if ! bash "$root/scripts/wine-run.sh" "$script"; then failed+=("${script#$root/}"); fi
+  rm -f "$live"
+  # The server writes how many of its objects were alive when the script's process let it go.
+  if ! DROQBXML_COM_LIVE_FILE="$(winepath -w "$live" 2>/dev/null)" \
+    bash "$root/scripts/wine-run.sh" "$script"; then
+    failed+=("${script#$root/}")
+  elif [ "$(cat "$live" 2>/dev/null)" != 0 ]; then
+    echo "objects left alive: $(cat "$live" 2>/dev/null || echo 'not reported')"
+    failed+=("${script#$root/} (objects left)")
+  fi
 done
+# The server's lifetime, from a C++ client.
+count=$((count + 1))
+echo "== com-lifetime.exe"
+lifetime="$(cd "$root/build/windows" && WINEDEBUG=-all wine com-lifetime.exe 2>&1 | tr -d '\r')" || true
+echo "$lifetime"
+grep -qx 'ALL PASS' <<<"$lifetime" || failed+=(com-lifetime.exe)
+
+# Unregistering removes every class; registering again brings them back.
+count=$((count + 1))
+echo "== regsvr32 /u, then regsvr32"
+(cd "$root/build/windows" && WINEDEBUG=-all wine regsvr32 /u /s DroQbXml.dll)
+if WINEDEBUG=-all wine reg query 'HKCR\DroQbXml.DroEstimate' >/dev/null 2>&1; then
+  failed+=("regsvr32 /u")
+fi
+if ! bash "$root/scripts/wine-run.sh" "$root/tests/com/smoke.vbs" >/dev/null; then
+  failed+=("regsvr32 again")
+fi
+
 if [ ${#failed[@]} -ne 0 ]; then
   echo "com-tests: ${#failed[@]} of $count scripts failed: ${failed[*]}" >&2
   exit 1

@@ -4,8 +4,10 @@
 # build/wine-prefix with the component and the request processor relay registered, starts
 # `droqbxml relay` (the embedded stand-in, reached from the Windows side as QuickBooks'
 # "QBXMLRP.RequestProcessor.1") unless one is listening, passes through what the script
-# prints, and exits non-zero when the script fails or does not print its closing line
-# "SCRIPT DONE" (Wine 8's cscript exits 0 even on a script error). Company files are Unix
+# prints, and exits non-zero when the script exits non-zero, prints a line starting "FAIL",
+# or does not print its closing line "SCRIPT DONE" (Wine 8's cscript exits 0 even on a
+# script error). Scripts end by running off their end rather than with WScript.Quit, which
+# under Wine leaves the script's objects unreleased. Company files are Unix
 # paths seen from Windows on drive Z: (/srv/books/x.qbw is Z:\srv\books\x.qbw).
 set -euo pipefail
 root="$(cd "$(dirname "$0")/.." && pwd)"
@@ -52,6 +54,9 @@ output="${output//$'\r'/}"
 printf '%s\n' "$output"
 if [ $code -ne 0 ]; then
   echo "wine-run: $script exited with $code" >&2; exit 1
+fi
+if grep -q '^FAIL' <<<"$output"; then
+  echo "wine-run: $script reported failures" >&2; exit 1
 fi
 if ! grep -qx 'SCRIPT DONE' <<<"$output"; then
   echo "wine-run: $script ended without its closing line (a script error?)" >&2; exit 1

@@ -97,4 +97,3 @@ api.SessionEnd
 api.ConnectionClose
 If failures = 0 Then WScript.Echo "ALL PASS"
 WScript.Echo "SCRIPT DONE"
-WScript.Quit failures

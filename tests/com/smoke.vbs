@@ -50,4 +50,3 @@ Check "nothing to read", cust.ParseRs("<QBXML/>"), 1
 
 If failures = 0 Then WScript.Echo "ALL PASS"
 WScript.Echo "SCRIPT DONE"
-WScript.Quit failures
