@@ -156,6 +156,7 @@ const ClassInfo& DroXmlSdkWrapper::typeInfo() {
           .getter(u"CoFilePathDefault", &W::CoFilePathDefault)
           .getter(u"ResponseStatus", &W::ResponseStatus)
           .method(u"TestForSdkComms", &W::TestForSdkComms)
+          .optional(1)
           .method(u"XMLUnEscape", &W::XMLUnEscape)
           .take());
   return info;

@@ -11,7 +11,7 @@ const ClassInfo& clsErrorNumbers::typeInfo() {
     for (const auto& entry : kErrorNumberNames) {
       const int32_t value = entry.value;
       members.custom(entry.name, MemberKind::Get,
-                     [value](Object&, Arguments) { return Variant(value); });
+                     [value](Object&, Arguments) { return Variant(value); }, {ValueType::Long, {}});
     }
     return ClassInfo(u"clsErrorNumbers", members.take());
   }();

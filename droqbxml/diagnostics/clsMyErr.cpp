@@ -50,24 +50,27 @@ const ClassInfo& clsMyErr::typeInfo() {
           .custom(u"Raise", MemberKind::Method,
                   [](Object& self, Arguments args) {
                     static_cast<clsMyErr&>(self).Raise(
-                        argument(args, 0), argument(args, 1), argument(args, 2),
-                        argument(args, 3), argument(args, 4), argument(args, 5),
-                        argument(args, 6));
+                        argument(args, 0), argument(args, 1), argument(args, 2), argument(args, 3),
+                        argument(args, 4), argument(args, 5), argument(args, 6));
                     return Variant();
-                  })
+                  },
+                  {ValueType::None, std::vector<ParamShape>(7, {ValueType::Any, false, true})})
           .method(u"SetErrorInfo", &clsMyErr::SetErrorInfo)
+          .optional(5)
           .custom(u"SetError", MemberKind::Method,
                   [](Object& self, Arguments args) {
                     const auto record = recordOf(argument(args, 0));
-                    static_cast<clsMyErr&>(self).SetError(
-                        record.value_or(ErrorRecord{}), argument(args, 1).toText());
+                    static_cast<clsMyErr&>(self).SetError(record.value_or(ErrorRecord{}),
+                                                          argument(args, 1).toText());
                     return Variant();
-                  })
+                  },
+                  {ValueType::None, {{ValueType::Any}, {ValueType::Text}}})
           .custom(u"LogError", MemberKind::Method,
                   [](Object& self, Arguments args) {
                     static_cast<clsMyErr&>(self).LogError(argument(args, 0));
                     return Variant();
-                  })
+                  },
+                  {ValueType::None, {{ValueType::Any, false, true}}})
           .take());
   return info;
 }

@@ -75,6 +75,7 @@ const ClassInfo& DroXmlBuilder::typeInfo() {
         .getter(u"RequestID", &B::RequestID)
         .method(u"RequestIDUp", &B::RequestIDUp)
         .method(u"CreateElement", &B::CreateElement)
+        .optional(2)
         .method(u"BuildRetCustomerInfo",
                 static_cast<void (B::*)(const Ref<DroCustomerCol>&)>(&B::BuildRetCustomerInfo))
         .method(u"BuildAddCustomer", &B::BuildAddCustomer)
@@ -83,10 +84,14 @@ const ClassInfo& DroXmlBuilder::typeInfo() {
         .method(u"BuildAddItem", &B::BuildAddItem)
         .method(u"BuildQueryByAll", &B::BuildQueryByAll)
         .method(u"BuildQueryByFullName", &B::BuildQueryByFullName)
+        .optional(1)
         .method(u"BuildQueryByListID", &B::BuildQueryByListID)
         .method(u"BuildQueryByActiveOrDate", &B::BuildQueryByActiveOrDate)
+        .optional(2)
         .method(u"BuildAddEstimate", &B::BuildAddEstimate)
+        .optional(1)
         .method(u"BuildAddInvoice", &B::BuildAddInvoice)
+        .optional(1)
         .method(u"IsSuccessRs", &B::IsSuccessRs)
         .method(u"XmlEscapeX", &B::XmlEscapeX);
     return ClassInfo(u"DroXmlBuilder", members.take());

@@ -10,36 +10,39 @@
 namespace droqbxml {
 namespace {
 
-// A late-bound call of a free function: arguments converted as for member functions.
+// A free function as a method: arguments converted as for member functions.
 template <class R, class... A>
-MemberCall callFree(R (*fn)(A...)) {
-  return [fn](Object&, Arguments args) {
-    return binding::callWith<R, A...>([fn](auto&&... a) -> R { return fn(a...); }, args,
-                                      std::index_sequence_for<A...>{});
-  };
+void addFree(Members& members, const Text& name, R (*fn)(A...)) {
+  members.custom(
+      name, MemberKind::Method,
+      [fn](Object&, Arguments args) {
+        return binding::callWith<R, A...>([fn](auto&&... a) -> R { return fn(a...); }, args,
+                                          std::index_sequence_for<A...>{});
+      },
+      binding::shapeOf<R, A...>());
 }
 
 }  // namespace
 
 const ClassInfo& basValidationsModule::typeInfo() {
   namespace checks = basValidations;
-  static const ClassInfo info(
-      u"basValidations",
-      Members()
-          .custom(u"CheckWageType", MemberKind::Method, callFree(&checks::CheckWageType))
-          .custom(u"CheckJobStatus", MemberKind::Method, callFree(&checks::CheckJobStatus))
-          .custom(u"CheckAccountType", MemberKind::Method, callFree(&checks::CheckAccountType))
-          .custom(u"CheckAMTTYPE", MemberKind::Method, callFree(&checks::CheckAMTTYPE))
-          .custom(u"CheckBOOLTYPE", MemberKind::Method, callFree(&checks::CheckBOOLTYPE))
-          .custom(u"CheckDATETYPE", MemberKind::Method, callFree(&checks::CheckDATETYPE))
-          .custom(u"CheckDATETIMETYPE", MemberKind::Method, callFree(&checks::CheckDATETIMETYPE))
-          .custom(u"CheckINTTYPE", MemberKind::Method, callFree(&checks::CheckINTTYPE))
-          .custom(u"CheckPRICETYPE", MemberKind::Method, callFree(&checks::CheckPRICETYPE))
-          .custom(u"CheckQUANTYPE", MemberKind::Method, callFree(&checks::CheckQUANTYPE))
-          .custom(u"CheckSTRTYPE", MemberKind::Method, callFree(&checks::CheckSTRTYPE))
-          .custom(u"CheckIDTYPE", MemberKind::Method, callFree(&checks::CheckIDTYPE))
-          .custom(u"CheckPERCENTTYPE", MemberKind::Method, callFree(&checks::CheckPERCENTTYPE))
-          .take());
+  static const ClassInfo info = [] {
+    Members members;
+    addFree(members, u"CheckWageType", &checks::CheckWageType);
+    addFree(members, u"CheckJobStatus", &checks::CheckJobStatus);
+    addFree(members, u"CheckAccountType", &checks::CheckAccountType);
+    addFree(members, u"CheckAMTTYPE", &checks::CheckAMTTYPE);
+    addFree(members, u"CheckBOOLTYPE", &checks::CheckBOOLTYPE);
+    addFree(members, u"CheckDATETYPE", &checks::CheckDATETYPE);
+    addFree(members, u"CheckDATETIMETYPE", &checks::CheckDATETIMETYPE);
+    addFree(members, u"CheckINTTYPE", &checks::CheckINTTYPE);
+    addFree(members, u"CheckPRICETYPE", &checks::CheckPRICETYPE);
+    addFree(members, u"CheckQUANTYPE", &checks::CheckQUANTYPE);
+    addFree(members, u"CheckSTRTYPE", &checks::CheckSTRTYPE);
+    addFree(members, u"CheckIDTYPE", &checks::CheckIDTYPE);
+    addFree(members, u"CheckPERCENTTYPE", &checks::CheckPERCENTTYPE);
+    return ClassInfo(u"basValidations", members.take());
+  }();
   return info;
 }
 

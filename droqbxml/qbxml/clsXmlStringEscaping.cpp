@@ -10,6 +10,7 @@ const ClassInfo& clsXmlStringEscaping::typeInfo() {
   static const ClassInfo info(u"clsXmlStringEscaping",
                               Members()
                                   .method(u"XMLEscape", &clsXmlStringEscaping::XMLEscape)
+                                  .optional(1)
                                   .method(u"XMLUnEscape", &clsXmlStringEscaping::XMLUnEscape)
                                   .take());
   return info;

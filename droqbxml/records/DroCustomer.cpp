@@ -25,7 +25,9 @@ const ClassInfo& DroCustomer::typeInfo() {
         .property(u"DroCustomerCol", &C::DroCustomerCol, &C::DroCustomerCol);
     addFieldMembers(members, kFields);
     members.method(u"ParseCustInfo", &C::ParseCustInfo)
+        .optional(1)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroCustomer", members.take());
   }();

@@ -14,7 +14,9 @@ const ClassInfo& DroCustomerCol::typeInfo() {
   static const ClassInfo info = [] {
     Members members = collectionMembers();
     members.method(u"ParseCustInfoUnEscaped", &C::ParseCustInfoUnEscaped)
+        .optional(1)
         .method(u"ParseCustInfo", &C::ParseCustInfo)
+        .optional(1)
         .method(u"BuildCustInfoXML", &C::BuildCustInfoXML);
     return ClassInfo(u"DroCustomerCol", members.take());
   }();

@@ -11,6 +11,7 @@ const ClassInfo& DroItemDiscount::typeInfo() {
         .property(u"SalesTaxCodeRef", &C::SalesTaxCodeRef, &C::SalesTaxCodeRef)
         .property(u"AccountRef", &C::AccountRef, &C::AccountRef)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemDiscount", members.take());
   }();

@@ -9,6 +9,7 @@ const ClassInfo& DroItemGroup::typeInfo() {
     Members members = itemMembers();
     members.property(u"ItemGroupLines", &C::ItemGroupLines, &C::ItemGroupLines)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemGroup", members.take());
   }();

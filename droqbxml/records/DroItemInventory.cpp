@@ -14,6 +14,7 @@ const ClassInfo& DroItemInventory::typeInfo() {
         .property(u"PrefVendorRef", &C::PrefVendorRef, &C::PrefVendorRef)
         .property(u"AssetAccountRef", &C::AssetAccountRef, &C::AssetAccountRef)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemInventory", members.take());
   }();

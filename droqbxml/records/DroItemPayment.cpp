@@ -10,6 +10,7 @@ const ClassInfo& DroItemPayment::typeInfo() {
     members.property(u"DepositToAccountRef", &C::DepositToAccountRef, &C::DepositToAccountRef)
         .property(u"PaymentMethodRef", &C::PaymentMethodRef, &C::PaymentMethodRef)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemPayment", members.take());
   }();

@@ -9,6 +9,7 @@ const ClassInfo& DroItemSalesTax::typeInfo() {
     Members members = itemMembers();
     members.property(u"TaxVendorRef", &C::TaxVendorRef, &C::TaxVendorRef)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemSalesTax", members.take());
   }();

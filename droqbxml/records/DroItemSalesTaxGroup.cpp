@@ -11,6 +11,7 @@ const ClassInfo& DroItemSalesTaxGroup::typeInfo() {
     Members members = itemMembers();
     members.property(u"ItemSalesTaxRefs", &C::ItemSalesTaxRefs, &C::ItemSalesTaxRefs)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemSalesTaxGroup", members.take());
   }();

@@ -50,7 +50,7 @@ std::optional<int32_t> kindNumber(const Variant& kind) {
 const ClassInfo& DroItemsCol::typeInfo() {
   static const ClassInfo info = [] {
     Members members;
-    members.method(u"Add", &DroItemsCol::Add);
+    members.method(u"Add", &DroItemsCol::Add).optional(1);
     addCommonMembers(members);
     return ClassInfo(u"DroItemsCol", members.take());
   }();

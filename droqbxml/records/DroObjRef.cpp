@@ -10,7 +10,9 @@ const ClassInfo& DroObjRef::typeInfo() {
     Members members;
     members.getter(u"IsEmpty", &DroObjRef::IsEmpty);
     addFieldMembers(members, kFields);
-    members.method(u"ParseRs", &DroObjRef::ParseRs).getter(u"PrintOut", &DroObjRef::PrintOut);
+    members.method(u"ParseRs", &DroObjRef::ParseRs)
+        .optional(2)
+        .getter(u"PrintOut", &DroObjRef::PrintOut);
     return ClassInfo(u"DroObjRef", members.take());
   }();
   return info;

@@ -15,6 +15,7 @@ const ClassInfo& DroSalesAndPurchase::typeInfo() {
         .property(u"PrefVendorRef", &C::PrefVendorRef, &C::PrefVendorRef)
         .getter(u"IsEmpty", &C::IsEmpty)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroSalesAndPurchase", members.take());
   }();

@@ -13,6 +13,7 @@ const ClassInfo& DroSalesItem<Kind>::typeInfo() {
         .property(u"SalesOrPurchase", &C::SalesOrPurchase, &C::SalesOrPurchase)
         .property(u"SalesAndPurchase", &C::SalesAndPurchase, &C::SalesAndPurchase)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(Text(kSpec.className), members.take());
   }();

@@ -13,6 +13,7 @@ const ClassInfo& DroSalesOrPurchase::typeInfo() {
     members.property(u"AccountRef", &C::AccountRef, &C::AccountRef)
         .getter(u"IsEmpty", &C::IsEmpty)
         .method(u"ParseRs", &C::ParseRs)
+        .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroSalesOrPurchase", members.take());
   }();

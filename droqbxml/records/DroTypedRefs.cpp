@@ -16,6 +16,7 @@ const ClassInfo& DroTypedRef<Kind>::typeInfo() {
                                   .property(u"FullName", &R::FullName, &R::FullName)
                                   .getter(u"IsEmpty", &R::IsEmpty)
                                   .method(u"ParseRs", &R::ParseRs)
+                                  .optional(2)
                                   .getter(u"PrintOut", &R::PrintOut)
                                   .take());
   return info;

@@ -96,18 +96,23 @@ void Record::addFieldMembers(Members& members, std::span<const FieldSpec> fields
   for (size_t i = 0; i < fields.size(); ++i) {
     const Text name(fields[i].name);
     if (fields[i].unescaped) {
-      members.custom(name + u"_XmlUnEscaped", MemberKind::Get, [i](Object& self, Arguments) {
-        return Variant(static_cast<Record&>(self).fieldValueUnescaped(i));
-      });
+      members.custom(name + u"_XmlUnEscaped", MemberKind::Get,
+                     [i](Object& self, Arguments) {
+                       return Variant(static_cast<Record&>(self).fieldValueUnescaped(i));
+                     },
+                     {ValueType::Text, {}});
     }
-    members.custom(name, MemberKind::Get, [i](Object& self, Arguments) {
-      return Variant(static_cast<Record&>(self).fieldValue(i));
-    });
-    members.custom(name, MemberKind::Let, [i](Object& self, Arguments args) {
-      if (args.size() != 1) binding::wrongArgumentCount();
-      static_cast<Record&>(self).setFieldValue(i, args[0].toText());
-      return Variant();
-    });
+    members.custom(
+        name, MemberKind::Get,
+        [i](Object& self, Arguments) { return Variant(static_cast<Record&>(self).fieldValue(i)); },
+        {ValueType::Text, {}});
+    members.custom(name, MemberKind::Let,
+                   [i](Object& self, Arguments args) {
+                     if (args.size() != 1) binding::wrongArgumentCount();
+                     static_cast<Record&>(self).setFieldValue(i, args[0].toText());
+                     return Variant();
+                   },
+                   {ValueType::None, {{ValueType::Text}}});
   }
 }
 

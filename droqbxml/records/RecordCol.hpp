@@ -57,9 +57,11 @@ class CollectionOf : public Object {
     members.method(u"Item", &C::Item)
         .getter(u"Count", &C::Count)
         .method(u"Remove", &C::Remove)
-        .custom(u"NewEnum", MemberKind::Method, [](Object& self, Arguments) {
-          return Variant(Enumerator::over(static_cast<const C&>(self).NewEnum()));
-        });
+        .custom(u"NewEnum", MemberKind::Method,
+                [](Object& self, Arguments) {
+                  return Variant(Enumerator::over(static_cast<const C&>(self).NewEnum()));
+                },
+                {ValueType::Unknown, {}});
   }
 
  private:
@@ -81,7 +83,7 @@ class RecordCol : public CollectionOf<T> {
   // Add, Item, Count, Remove, NewEnum.
   static Members collectionMembers() {
     Members members;
-    members.method(u"Add", &RecordCol<T>::Add);
+    members.method(u"Add", &RecordCol<T>::Add).optional(2);
     CollectionOf<T>::addCommonMembers(members);
     return members;
   }

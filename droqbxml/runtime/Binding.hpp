@@ -6,6 +6,7 @@
 #ifndef DROQBXML_RUNTIME_BINDING_HPP_
 #define DROQBXML_RUNTIME_BINDING_HPP_
 
+#include <algorithm>
 #include <cstddef>
 #include <tuple>
 #include <type_traits>
@@ -61,6 +62,37 @@ Variant toVariant(T&& value) {
   }
 }
 
+template <class T>
+constexpr ValueType valueTypeOf() {
+  using U = std::remove_cvref_t<T>;
+  if constexpr (std::is_void_v<U>) {
+    return ValueType::None;
+  } else if constexpr (std::is_same_v<U, Text>) {
+    return ValueType::Text;
+  } else if constexpr (std::is_same_v<U, bool>) {
+    return ValueType::Boolean;
+  } else if constexpr (std::is_same_v<U, int16_t>) {
+    return ValueType::Short;
+  } else if constexpr (std::is_same_v<U, int32_t> || std::is_enum_v<U>) {
+    return ValueType::Long;
+  } else if constexpr (std::is_same_v<U, double>) {
+    return ValueType::Double;
+  } else if constexpr (std::is_convertible_v<U, Ref<Object>>) {
+    return ValueType::Object;
+  } else {
+    return ValueType::Any;
+  }
+}
+
+template <class R, class... A>
+Shape shapeOf() {
+  return Shape{
+      valueTypeOf<R>(),
+      {ParamShape{valueTypeOf<A>(),
+                  std::is_lvalue_reference_v<A> && !std::is_const_v<std::remove_reference_t<A>>,
+                  false}...}};
+}
+
 [[noreturn]] inline void wrongArgumentCount() {
   raiseError(450, u"DroQbXml", u"Wrong number of arguments or invalid property assignment");
 }
@@ -99,20 +131,24 @@ namespace binding {
 
 template <class C, class R, class... A>
 MemberBinding bindMethod(Text name, MemberKind kind, R (C::*fn)(A...)) {
-  return {std::move(name), kind, [fn](Object& self, Arguments args) {
+  return {std::move(name), kind,
+          [fn](Object& self, Arguments args) {
             auto& object = static_cast<C&>(self);
             return callWith<R, A...>([&](auto&&... a) -> R { return (object.*fn)(a...); }, args,
                                      std::index_sequence_for<A...>{});
-          }};
+          },
+          shapeOf<R, A...>()};
 }
 
 template <class C, class R, class... A>
 MemberBinding bindMethod(Text name, MemberKind kind, R (C::*fn)(A...) const) {
-  return {std::move(name), kind, [fn](Object& self, Arguments args) {
+  return {std::move(name), kind,
+          [fn](Object& self, Arguments args) {
             const auto& object = static_cast<const C&>(self);
             return callWith<R, A...>([&](auto&&... a) -> R { return (object.*fn)(a...); }, args,
                                      std::index_sequence_for<A...>{});
-          }};
+          },
+          shapeOf<R, A...>()};
 }
 
 template <class V>
@@ -149,9 +185,18 @@ class Members {
     list_.push_back(binding::bindMethod(name, MemberKind::Method, fn));
     return *this;
   }
-  // A member whose late-bound form needs code of its own.
-  Members& custom(const Text& name, MemberKind kind, MemberCall call) {
-    list_.push_back({name, kind, std::move(call)});
+  // A member whose late-bound form needs code of its own, and the shape of its call.
+  Members& custom(const Text& name, MemberKind kind, MemberCall call, Shape shape = {}) {
+    list_.push_back({name, kind, std::move(call), std::move(shape)});
+    return *this;
+  }
+  // Marks the last `count` arguments of the member just added as optional: those the C++
+  // declaration gives defaults (a left-out argument takes its type's empty value).
+  Members& optional(size_t count) {
+    auto& params = list_.back().shape.params;
+    for (size_t i = params.size() - std::min(count, params.size()); i < params.size(); ++i) {
+      params[i].optional = true;
+    }
     return *this;
   }
 

@@ -21,11 +21,12 @@ ClassInfo::ClassInfo(Text className, std::vector<MemberBinding> members)
     if (found == ids_.end()) {
       id = static_cast<int32_t>(members_.size());
       ids_.emplace(key, id);
-      members_.push_back(Member{std::move(binding.name), {}});
+      members_.push_back(Member{std::move(binding.name), {}, {}});
     } else {
       id = found->second;
     }
     members_[static_cast<size_t>(id)].calls[slot(binding.kind)] = std::move(binding.call);
+    members_[static_cast<size_t>(id)].shapes[slot(binding.kind)] = std::move(binding.shape);
   }
 }
 
@@ -42,6 +43,11 @@ const Text& ClassInfo::memberName(int32_t id) const {
 bool ClassInfo::hasKind(int32_t id, MemberKind kind) const {
   return id >= 0 && id < memberCount() &&
          static_cast<bool>(members_[static_cast<size_t>(id)].calls[slot(kind)]);
+}
+
+const Shape& ClassInfo::shape(int32_t id, MemberKind kind) const {
+  if (id < 0 || id >= memberCount()) raiseRuntimeError(RuntimeError::kMemberNotSupported);
+  return members_[static_cast<size_t>(id)].shapes[slot(kind)];
 }
 
 Variant ClassInfo::invoke(Object& self, int32_t id, MemberKind kind, Arguments args) const {

@@ -27,10 +27,24 @@ enum class MemberKind : uint8_t { Get, Let, Set, Method };
 using Arguments = std::span<Variant>;
 using MemberCall = std::function<Variant(Object& self, Arguments args)>;
 
+// What a member's call returns and takes, as the type library describes it: the value
+// kinds of the automation platform, an argument passed by reference being in/out.
+enum class ValueType : uint8_t { None, Text, Boolean, Short, Long, Double, Any, Object, Unknown };
+struct ParamShape {
+  ValueType type = ValueType::Any;
+  bool inOut = false;
+  bool optional = false;
+};
+struct Shape {
+  ValueType result = ValueType::Any;
+  std::vector<ParamShape> params;
+};
+
 struct MemberBinding {
   Text name;
   MemberKind kind;
   MemberCall call;
+  Shape shape;
 };
 
 // A class's name and member table: the class's entry of the component's type library.
@@ -44,12 +58,15 @@ class ClassInfo {
   const Text& memberName(int32_t id) const;
   int32_t memberCount() const noexcept { return static_cast<int32_t>(members_.size()); }
   bool hasKind(int32_t id, MemberKind kind) const;
+  // The shape of a member's call of that kind (hasKind first).
+  const Shape& shape(int32_t id, MemberKind kind) const;
   Variant invoke(Object& self, int32_t id, MemberKind kind, Arguments args) const;
 
  private:
   struct Member {
     Text name;
     MemberCall calls[4];
+    Shape shapes[4];
   };
   Text className_;
   std::vector<Member> members_;
