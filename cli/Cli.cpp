@@ -161,10 +161,15 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
   auto* demo = app.add_subcommand(
       "demo",
       "Add customers, items, an estimate and an invoice to a company file of the embedded "
-      "stand-in, a line a step");
+      "stand-in: a line a step (what was sent, the status, the record read back) and a summary");
   addConnectionOptions(*demo, connection);
+  demo->get_option("--company")
+      ->description(
+          "Company file to use, created when missing and kept (default: a temporary one)");
   bool verbose = false;
-  demo->add_flag("--verbose,-v", verbose, "Print every request, response and record dump");
+  demo->add_flag("--verbose,-v", verbose,
+                 "Also print every request, response and record dump, and what lint finds in "
+                 "each refused request");
 
   int port = 7371;
   auto* relay = app.add_subcommand(

@@ -11,6 +11,7 @@
 #include <functional>
 #include <initializer_list>
 #include <ostream>
+#include <random>
 #include <string>
 #include <system_error>
 #include <utility>
@@ -58,8 +59,14 @@ size_t countOf(const Text& response, const std::string& retTag) {
   return count;
 }
 
-// The first response's status as QuickBooks wrote it, when it is not plain success.
-std::string quickBooksStatus(const Text& response) {
+// The first response's status as QuickBooks wrote it; an empty code when there is none.
+struct QuickBooksStatus {
+  std::string code;
+  std::string severity;
+  std::string message;
+};
+
+QuickBooksStatus quickBooksStatus(const Text& response) {
   // The text of an attribute up to the first of `ends` after it.
   const auto attribute = [&](const char* name, std::initializer_list<TextView> ends) {
     const Text key = fromUtf8(std::string(name) + "=\"");
@@ -70,24 +77,36 @@ std::string quickBooksStatus(const Text& response) {
     for (const TextView end : ends) close = std::min(close, response.find(end, from));
     return close == Text::npos ? std::string() : toUtf8(response.substr(from, close - from));
   };
-  const std::string code = attribute("statusCode", {u"\""});
-  if (code.empty() || code == "0") return {};
   // The message is the last attribute; the wrapper's unescaping may have put quotes in it.
-  return code + " " + attribute("statusSeverity", {u"\""}) + ": " +
-         attribute("statusMessage", {u"\">", u"\" />", u"\"/>"});
+  return {attribute("statusCode", {u"\""}), attribute("statusSeverity", {u"\""}),
+          attribute("statusMessage", {u"\">", u"\" />", u"\"/>"})};
 }
 
-// A record's identity in one line, read through its members by name.
+// A record in one line: how QuickBooks knows it (ListID or TxnID, FullName or Name, a
+// reference number, EditSequence) and its balance, stock or total where it has one. Members
+// the record lacks or left empty are left out.
 std::string identity(Object& record) {
+  const ClassInfo& info = record.classInfo();
   std::string text;
-  for (const TextView name : {u"ListID", u"FullName", u"EditSequence"}) {
-    const ClassInfo& info = record.classInfo();
+  for (const TextView name : {u"ListID", u"TxnID", u"FullName", u"RefNumber", u"EditSequence",
+                              u"Balance", u"QuantityOnHand", u"TotalAmount", u"BalanceRemaining"}) {
     TextView member = name;
     if (name == u"FullName" && info.findMember(name) < 0) member = u"Name";
     if (info.findMember(member) < 0) continue;
-    text += (text.empty() ? "" : ", ") + toUtf8(Text(member)) + " " +
-            toUtf8(record.get(member).toText());
+    const std::string value = toUtf8(record.get(member).toText());
+    if (value.empty()) continue;
+    text += (text.empty() ? "" : ", ") + toUtf8(Text(member)) + " " + value;
   }
+  return text.empty() ? "nothing" : text;
+}
+
+// The first problem lint finds in a request QuickBooks refused, in a few words.
+std::string firstProblem(const Text& request) {
+  const auto problems = simulator::readRequest(toUtf8(request)).problems;
+  if (problems.empty()) return "lint finds nothing";
+  std::string text =
+      "lint, line " + std::to_string(problems.front().line) + ": " + problems.front().message;
+  if (problems.size() > 1) text += " (and " + std::to_string(problems.size() - 1) + " more)";
   return text;
 }
 
@@ -138,8 +157,12 @@ class Report {
     }
   }
 
-  // The step's line: its outcome, title, status and what was read back.
-  void step(Outcome outcome, const std::string& title, const std::string& result) {
+  // One step in one line, the only way a step reports: its mark (ok, refused as expected,
+  // FAILED), what was sent, how QuickBooks answered and, when given, what was read back:
+  //   ok      BuildAddAccount "Job Materials 1": RSSuccess (0); read back ListID 8000..
+  // The summary counts the marks.
+  void step(Outcome outcome, const std::string& sent, const std::string& status,
+            const std::string& readBack = {}) {
     ++steps_;
     const char* mark = "ok      ";
     if (outcome == Outcome::RefusedAsExpected) {
@@ -149,14 +172,18 @@ class Report {
       mark = "FAILED  ";
       ++unexpected_;
     }
-    io_.out << mark << title << ": " << result << (verbose_ ? "\n\n" : "\n");
+    io_.out << mark << sent << ": " << status << (readBack.empty() ? "" : "; ") << readBack
+            << (verbose_ ? "\n\n" : "\n");
   }
 
-  void summary(const std::string& company) {
+  // The closing lines: the steps as counted, and the company file the demo used.
+  void summary(const std::string& company, bool temporary) {
     io_.out << "\n"
-            << steps_ << " steps on " << company << ": " << steps_ - refused_ - unexpected_
-            << " answered with success, " << refused_ << " refused as expected, " << unexpected_
-            << " unexpected.\n";
+            << steps_ << " steps: " << steps_ - refused_ - unexpected_ << " answered with success, "
+            << refused_ << " refused as expected, " << unexpected_
+            << " unexpected.\nCompany file: " << company
+            << (temporary ? " (temporary, removed)" : " (kept: run again to add more to it)")
+            << "\n";
   }
   bool allAsExpected() const { return unexpected_ == 0; }
 
@@ -168,18 +195,27 @@ class Report {
   int unexpected_ = 0;
 };
 
+// The wrapper's ResponseStatus and, unless it is plain success, how QuickBooks put it:
+//   RSNoMatch (1) Info: A query request did not find a matching object in QuickBooks
+//   RSTaxErrorInvoice (31401), QuickBooks 3140 Error: There is an invalid reference ...
 std::string statusLine(Session& session, const Text& response) {
-  const std::string quickBooks = quickBooksStatus(response);
-  return statusText(session.status()) + (quickBooks.empty() ? "" : " (" + quickBooks + ")");
+  const QuickBooksStatus quickBooks = quickBooksStatus(response);
+  std::string text = statusText(session.status());
+  if (quickBooks.code.empty() || quickBooks.code == "0") return text;
+  if (quickBooks.code != std::to_string(session.status())) {
+    text += ", QuickBooks " + quickBooks.code;
+  }
+  return text + " " + quickBooks.severity + ": " + quickBooks.message;
 }
 
-void query(Report& report, Session& session, const std::string& title, const QueryOptions& options,
+// A builder query as a step; the response, for what the demo reads of it.
+Text query(Report& report, Session& session, const std::string& title, const QueryOptions& options,
            const std::string& retTag) {
   const Text response = report.send(session, title, buildQuery(options));
   const bool ok = session.status() == RSSuccess || session.status() == RSNoMatch;
-  report.step(ok ? Outcome::Succeeded : Outcome::Unexpected, title,
-              statusLine(session, response) + "; " + std::to_string(countOf(response, retTag)) +
-                  " " + retTag);
+  report.step(ok ? Outcome::Succeeded : Outcome::Unexpected, title, statusLine(session, response),
+              std::to_string(countOf(response, retTag)) + " " + retTag);
+  return response;
 }
 
 // Sends what `build` writes for one list record (a customer, job, account or item), checks
@@ -195,10 +231,8 @@ void addListRecord(Report& report, Session& session, const std::string& title,
   if (refusedBySchema) {
     const bool refused = session.status() == RSParsingError;
     report.step(refused ? Outcome::RefusedAsExpected : Outcome::Unexpected, title,
-                statusLine(session, response) +
-                    (refused ? "; QuickBooks' schema refuses it as the component writes it "
-                               "(see the README)"
-                             : "; this request was meant to be refused by the schema"));
+                statusLine(session, response),
+                refused ? firstProblem(builder.XML()) : "meant to be refused by the schema");
     return;
   }
   if (!builder.IsSuccessRs(response, record->RequestID())) {
@@ -206,8 +240,8 @@ void addListRecord(Report& report, Session& session, const std::string& title,
     return;
   }
   record->ParseRs(response);
-  report.step(Outcome::Succeeded, title,
-              statusLine(session, response) + "; read back " + identity(*record));
+  report.step(Outcome::Succeeded, title, statusLine(session, response),
+              "read back " + identity(*record));
   report.dump("Read back with ParseRs, PrintOut", [&] { return record->PrintOut(); });
 }
 
@@ -366,28 +400,23 @@ void fillLines(Lines& lines, Groups& groups, const Items& items, const Text& set
   group->Quantity(u"1");
 }
 
-// What QuickBooks answered for a transaction, and what the record read of it.
-std::string txnResult(Session& session, const Text& response, const std::string& retTag,
-                      const std::string& total, const Text& txnIdRead) {
-  std::string text = statusLine(session, response) + "; QuickBooks: TxnID " +
-                     firstValue(response, "TxnID") + ", Subtotal " +
-                     firstValue(response, "Subtotal") + ", SalesTaxTotal " +
-                     firstValue(response, "SalesTaxTotal") + ", " + total + " " +
-                     firstValue(response, total) + "; ParseRs read ";
-  if (!txnIdRead.empty()) return text + "TxnID " + toUtf8(txnIdRead);
+// What was read back of a transaction QuickBooks added: the record, when its ParseRs found
+// the answer; otherwise QuickBooks' own figures and why the record stayed as it was.
+std::string txnReadBack(Object& record, const Text& txnIdRead, const Text& response,
+                        const std::string& retTag, const std::string& total) {
+  if (!txnIdRead.empty()) return "read back " + identity(record);
   // The records look for the add-response tags the component has always looked for.
-  return text + "nothing: it looks for \"" + retTag.substr(0, retTag.size() - 3) +
-         "AddRet\" and QuickBooks answers with \"" + retTag + "\"";
+  return "QuickBooks: TxnID " + firstValue(response, "TxnID") + ", " + total + " " +
+         firstValue(response, total) + " (sales tax " + firstValue(response, "SalesTaxTotal") +
+         "); ParseRs read nothing: it looks for " + retTag.substr(0, retTag.size() - 3) +
+         "AddRet, QuickBooks answers " + retTag;
 }
 
-// An inventory item's quantity on hand, from the list of every inventory item.
-std::string onHand(Report& report, Session& session, const Text& item) {
-  QueryOptions options;
-  options.kind = udEtItemInv;
-  const Text response = report.send(session, "Inventory items", buildQuery(options));
+// An inventory item's quantity on hand, from a response listing inventory items.
+std::string quantityOnHand(const Text& inventoryItems, const Text& item) {
   const size_t at =
-      response.find(u"<FullName>" + DroXmlBuilder().XmlEscapeX(item) + u"</FullName>");
-  return at == Text::npos ? std::string() : firstValue(response.substr(at), "QuantityOnHand");
+      inventoryItems.find(u"<FullName>" + DroXmlBuilder().XmlEscapeX(item) + u"</FullName>");
+  return at == Text::npos ? std::string() : firstValue(inventoryItems.substr(at), "QuantityOnHand");
 }
 
 void addEstimateAndInvoice(Report& report, Session& session, const Text& run, const Text& customer,
@@ -410,11 +439,15 @@ void addEstimateAndInvoice(Report& report, Session& session, const Text& run, co
   const bool estimateOk = builder.IsSuccessRs(estimated, estimate->RequestID());
   estimate->ParseRs(estimated);
   report.step(estimateOk ? Outcome::Succeeded : Outcome::Unexpected, estimateTitle,
-              txnResult(session, estimated, "EstimateRet", "TotalAmount", estimate->TxnID()));
+              statusLine(session, estimated),
+              txnReadBack(*estimate, estimate->TxnID(), estimated, "EstimateRet", "TotalAmount"));
   // An estimate holding a line group cannot be dumped: PrintOut raises 13.
   report.dump("PrintOut", [&] { return estimate->PrintOut(); });
 
-  const std::string before = onHand(report, session, items.tile->Name());
+  QueryOptions inventory;
+  inventory.kind = udEtItemInv;
+  const std::string before = quantityOnHand(
+      report.send(session, "Inventory items", buildQuery(inventory)), items.tile->Name());
   auto invoice = std::make_shared<DroInvoice>();
   invoice->CustomerRef()->FullName(customer);
   invoice->PONumber(u"PO-" + run);
@@ -426,13 +459,17 @@ void addEstimateAndInvoice(Report& report, Session& session, const Text& run, co
   const bool invoiceOk = builder.IsSuccessRs(invoiced, invoice->RequestID());
   invoice->ParseRs(invoiced);
   report.step(invoiceOk ? Outcome::Succeeded : Outcome::Unexpected, invoiceTitle,
-              txnResult(session, invoiced, "InvoiceRet", "BalanceRemaining", invoice->TxnID()));
+              statusLine(session, invoiced),
+              txnReadBack(*invoice, invoice->TxnID(), invoiced, "InvoiceRet", "BalanceRemaining"));
   report.dump("The line group's PrintOut",
               [&] { return invoice->InvoiceLineGroups()->Item(Variant(1))->PrintOut(); });
-  const std::string after = onHand(report, session, items.tile->Name());
-  report.step(before != after ? Outcome::Succeeded : Outcome::Unexpected,
-              "Quantity on hand of \"" + toUtf8(items.tile->Name()) + "\"",
-              before + " before the invoice, " + after + " after (12 sold, 10 more in the set)");
+  const std::string title = "BuildQueryByAll udEtItemInv after the invoice";
+  const Text stock = report.send(session, title, buildQuery(inventory));
+  const std::string after = quantityOnHand(stock, items.tile->Name());
+  report.step(before != after ? Outcome::Succeeded : Outcome::Unexpected, title,
+              statusLine(session, stock),
+              "QuantityOnHand of \"" + toUtf8(items.tile->Name()) + "\" " + before + " before, " +
+                  after + " after (12 on a line, 10 in the set)");
 }
 
 // With sales tax off, QuickBooks refuses a line tax code: the wrapper reports it with its own
@@ -441,7 +478,7 @@ void taxCodeOutcome(Io io, Report& report, const ConnectionOptions& options) {
   report.out() << "\nA company file with sales tax off: " << options.company << '\n';
   Session session(io, options);
   if (!session.open()) {
-    report.step(Outcome::Unexpected, "Session on the company without sales tax", "no session");
+    report.step(Outcome::Unexpected, "A session on the company without sales tax", "no session");
     return;
   }
   DroXmlBuilder& builder = *session.facade().XML();
@@ -484,17 +521,41 @@ void taxCodeOutcome(Io io, Report& report, const ConnectionOptions& options) {
               statusLine(session, accepted));
 }
 
+// A folder of this run's own for the company files it makes up, removed with everything in
+// it at the end: two demos at once, or one left behind, never share a file.
+class TemporaryFolder {
+ public:
+  TemporaryFolder() {
+    // Where the folder cannot be made, creating the company files in it reports why.
+    std::random_device random;
+    std::error_code error;
+    do {
+      path_ = std::filesystem::temp_directory_path(error) /
+              ("droqbxml-demo-" + std::to_string(random()));
+    } while (!error && !std::filesystem::create_directory(path_, error) && !error);
+  }
+  ~TemporaryFolder() {
+    std::error_code ignored;
+    std::filesystem::remove_all(path_, ignored);
+  }
+  TemporaryFolder(const TemporaryFolder&) = delete;
+  TemporaryFolder& operator=(const TemporaryFolder&) = delete;
+
+  const std::filesystem::path& path() const { return path_; }
+
+ private:
+  std::filesystem::path path_;
+};
+
 }  // namespace
 
 int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
   ConnectionOptions connection = options;
-  std::error_code ignored;
-  const std::filesystem::path temporary = std::filesystem::temp_directory_path() / "droqbxml-demo";
-  std::filesystem::remove_all(temporary, ignored);
-  std::filesystem::create_directories(temporary);
-  if (connection.company.empty()) connection.company = (temporary / "demo-company.qbw").string();
+  const TemporaryFolder temporary;
+  const bool temporaryCompany = connection.company.empty();
+  if (temporaryCompany) connection.company = (temporary.path() / "demo-company.qbw").string();
   ConnectionOptions noTax = connection;
-  noTax.company = (temporary / "no-sales-tax.qbw").string();
+  noTax.company = (temporary.path() / "no-sales-tax.qbw").string();
   try {
     if (!std::filesystem::exists(connection.company)) {
       simulator::CompanyFile::create(connection.company, {"Demo Company", true});
@@ -528,14 +589,8 @@ int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
             "ItemNonInventoryRet");
       query(report, session, "BuildQueryByAll udEtItemOther", all(udEtItemOther),
             "ItemOtherChargeRet");
-      const Text existing = report.send(session, "All customers", buildQuery(all(udEtCustomer)));
-      report.step(session.status() == RSSuccess || session.status() == RSNoMatch
-                      ? Outcome::Succeeded
-                      : Outcome::Unexpected,
-                  "BuildQueryByAll udEtCustomer",
-                  statusLine(session, existing) + "; " +
-                      std::to_string(countOf(existing, "CustomerRet")) + " CustomerRet");
-      const Text run = runLabel(existing);
+      const Text run = runLabel(
+          query(report, session, "BuildQueryByAll udEtCustomer", all(udEtCustomer), "CustomerRet"));
 
       auto kim = std::make_shared<DroCustomer>();
       kim->Name(u"Kim Lee " + run);
@@ -567,7 +622,7 @@ int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
       found.ParseRs(named);
       report.step(found.ListID().empty() ? Outcome::Unexpected : Outcome::Succeeded,
                   "BuildQueryByFullName \"" + byName.fullName.value() + "\"",
-                  statusLine(session, named) + "; read " + identity(found));
+                  statusLine(session, named), "read " + identity(found));
       report.dump("PrintOut", [&] { return found.PrintOut(); });
       QueryOptions byId;
       byId.kind = udEtCustomer;
@@ -576,8 +631,8 @@ int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
       DroCustomer same;
       same.ParseRs(identified);
       report.step(same.ListID().empty() ? Outcome::Unexpected : Outcome::Succeeded,
-                  "BuildQueryByListID " + byId.listId.value(),
-                  statusLine(session, identified) + "; read " + identity(same));
+                  "BuildQueryByListID " + byId.listId.value(), statusLine(session, identified),
+                  "read " + identity(same));
       report.dump("PrintOut", [&] { return same.PrintOut(); });
 
       const Items items = addAccountAndItems(report, session, run);
@@ -587,8 +642,7 @@ int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
     taxCodeOutcome(io, report, noTax);
   }
   io.out << "Sessions ended, connections closed.\n";
-  report.summary(connection.company);
-  std::filesystem::remove_all(temporary, ignored);
+  report.summary(connection.company, temporaryCompany);
   return report.allAsExpected() ? kExitSuccess : kExitNotSuccess;
 }
 
