@@ -26,8 +26,16 @@ bench: setup
 # mingw-w64; com-test drives it with VBScript and JScript under Wine.
 com:
 	@bash scripts/setup-deps.sh com
+	cmake --preset release
+	cmake --build --preset release --target droqbxml_idl droqbxml_command
+	mkdir -p build/windows
+	./build/release/com/typelib/droqbxml_idl idl > build/windows/DroQbXml.idl.new
+	cmp -s build/windows/DroQbXml.idl.new build/windows/DroQbXml.idl || \
+	  mv build/windows/DroQbXml.idl.new build/windows/DroQbXml.idl
+	rm -f build/windows/DroQbXml.idl.new
+	./build/release/com/typelib/droqbxml_idl listing > build/windows/typelib-listing.txt
 	cmake -S com -B build/windows -G Ninja -DCMAKE_TOOLCHAIN_FILE=$(CURDIR)/cmake/mingw-w64.cmake \
-	  -DCMAKE_BUILD_TYPE=Release
+	  -DCMAKE_BUILD_TYPE=Release -DDROQBXML_IDL=$(CURDIR)/build/windows/DroQbXml.idl
 	cmake --build build/windows
 
 com-test: com

@@ -8,6 +8,7 @@
 #include <new>
 #include <vector>
 
+#include "com/typelib/TypeLibrary.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Enumerator.hpp"
 
@@ -21,9 +22,20 @@ static_assert(sizeof(OLECHAR) == sizeof(char16_t));
 constexpr IID kOwnObject = {
     0x6c0d3b52, 0x8f1e, 0x4c35, {0x9a, 0x0b, 0x4d, 0x52, 0xf0, 0xa1, 0xe7, 0xc3}};
 
-// Member ids of the late-binding table start at 0; DISPIDs at 1, since 0 is the default
-// member (a collection's Item) and -4 the enumerator (NewEnum).
-constexpr DISPID kFirstMember = 1;
+// The type library embedded in this module, loaded once; nothing when it cannot be.
+ITypeLib* ownLibrary() {
+  static ITypeLib* library = [] {
+    HMODULE module = nullptr;
+    GetModuleHandleExW(
+        GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+        reinterpret_cast<LPCWSTR>(&ownLibrary), &module);
+    wchar_t path[MAX_PATH];
+    GetModuleFileNameW(module, path, MAX_PATH);
+    ITypeLib* loaded = nullptr;
+    return SUCCEEDED(LoadTypeLibEx(path, REGKIND_NONE, &loaded)) ? loaded : nullptr;
+  }();
+  return library;
+}
 
 // The runtime's "Wrong number of arguments or invalid property assignment".
 constexpr int32_t kWrongArgumentCount = 450;
@@ -290,14 +302,19 @@ class DispatchObject final : public Counted<IDispatch> {
     return E_NOINTERFACE;
   }
 
+  // The class's interface in the type library (objects of classes it does not describe,
+  // such as a NewEnum enumerator reached by name, have none).
   HRESULT STDMETHODCALLTYPE GetTypeInfoCount(UINT* count) override {
     if (count == nullptr) return E_POINTER;
-    *count = 0;
+    ITypeInfo* info = typeInfo();
+    *count = info != nullptr ? 1 : 0;
+    if (info != nullptr) info->Release();
     return S_OK;
   }
-  HRESULT STDMETHODCALLTYPE GetTypeInfo(UINT, LCID, ITypeInfo** info) override {
-    if (info != nullptr) *info = nullptr;
-    return DISP_E_BADINDEX;
+  HRESULT STDMETHODCALLTYPE GetTypeInfo(UINT index, LCID, ITypeInfo** info) override {
+    if (info == nullptr) return E_POINTER;
+    *info = index == 0 ? typeInfo() : nullptr;
+    return *info != nullptr ? S_OK : DISP_E_BADINDEX;
   }
 
   HRESULT STDMETHODCALLTYPE GetIDsOfNames(REFIID, LPOLESTR* names, UINT count, LCID,
@@ -310,7 +327,7 @@ class DispatchObject final : public Counted<IDispatch> {
     if (name == u"_NewEnum" && info.findMember(u"NewEnum") >= 0) {
       ids[0] = DISPID_NEWENUM;
     } else if (id >= 0) {
-      ids[0] = id + kFirstMember;
+      ids[0] = dispIdOf(info, id);
     } else {
       ids[0] = DISPID_UNKNOWN;
       result = DISP_E_UNKNOWNNAME;
@@ -332,10 +349,8 @@ class DispatchObject final : public Counted<IDispatch> {
       return DISP_E_NONAMEDARGS;
     }
     const ClassInfo& info = object_->classInfo();
-    int32_t id = static_cast<int32_t>(dispid) - kFirstMember;
-    if (dispid == DISPID_VALUE) id = info.findMember(u"Item");
-    if (dispid == DISPID_NEWENUM) id = info.findMember(u"NewEnum");
-    if (id < 0 || id >= info.memberCount()) return DISP_E_MEMBERNOTFOUND;
+    const int32_t id = memberIdOf(info, static_cast<int32_t>(dispid));
+    if (id < 0) return DISP_E_MEMBERNOTFOUND;
     try {
       // The arguments come last to first; a put's value (the named argument) is the last.
       std::vector<Variant> args;
@@ -374,6 +389,16 @@ class DispatchObject final : public Counted<IDispatch> {
   }
 
  private:
+  ITypeInfo* typeInfo() const {
+    ITypeLib* library = ownLibrary();
+    ITypeInfo* info = nullptr;
+    if (library == nullptr ||
+        FAILED(library->GetTypeInfoOfGuid(toGuid(interfaceIdOf(object_->className())), &info))) {
+      return nullptr;
+    }
+    return info;
+  }
+
   // The member's call. A property read with arguments that it does not take reads the
   // property and passes the arguments to the default member of what it holds, as
   // `est.EstimateLines(1)` means on the platform.
@@ -426,6 +451,15 @@ Ref<Object> objectInside(IUnknown* unknown) {
 }
 
 }  // namespace
+
+GUID toGuid(const Guid& guid) {
+  GUID out;
+  out.Data1 = guid.data1;
+  out.Data2 = guid.data2;
+  out.Data3 = guid.data3;
+  for (size_t i = 0; i < 8; ++i) out.Data4[i] = guid.data4[i];
+  return out;
+}
 
 std::atomic<long>& liveObjects() {
   static std::atomic<long> count{0};

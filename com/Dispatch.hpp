@@ -11,6 +11,7 @@
 
 #include <atomic>
 
+#include "com/typelib/TypeLibrary.hpp"
 #include "droqbxml/runtime/Object.hpp"
 
 namespace droqbxml::com {
@@ -18,6 +19,9 @@ namespace droqbxml::com {
 // COM objects alive and class-factory locks held, for DllCanUnloadNow.
 std::atomic<long>& liveObjects();
 std::atomic<long>& serverLocks();
+
+// The platform's form of one of the type library's GUIDs.
+GUID toGuid(const Guid& guid);
 
 // A new automation object over `object` (one reference held by the caller).
 IDispatch* dispatchFor(Ref<Object> object);

@@ -2,6 +2,7 @@
 // ProgID through the component's own class factory, and the registration of those classes.
 // CLSIDs are derived from the ProgIDs, so they stay the same from build to build.
 #include <objbase.h>
+#include <oleauto.h>
 #include <olectl.h>
 #include <windows.h>
 
@@ -12,6 +13,7 @@
 #include <vector>
 
 #include "com/Dispatch.hpp"
+#include "com/typelib/TypeLibrary.hpp"
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -20,26 +22,7 @@ namespace {
 
 HMODULE thisModule = nullptr;
 
-// A CLSID for a ProgID: two 64-bit FNV-1a hashes of the name under different offsets, marked
-// as a name-based GUID (version 5 bits, RFC 4122 variant).
-CLSID clsidOf(const Text& progId) {
-  const auto hash = [&](uint64_t value) {
-    for (const char16_t unit : progId) {
-      value ^= static_cast<uint64_t>(unit);
-      value *= 1099511628211ULL;
-    }
-    return value;
-  };
-  const uint64_t high = hash(14695981039346656037ULL);
-  const uint64_t low = hash(0x6a09e667f3bcc909ULL);
-  CLSID id;
-  id.Data1 = static_cast<unsigned long>(high >> 32);
-  id.Data2 = static_cast<unsigned short>(high >> 16);
-  id.Data3 = static_cast<unsigned short>((high & 0x0FFF) | 0x5000);
-  for (int i = 0; i < 8; ++i) id.Data4[i] = static_cast<unsigned char>(low >> (56 - 8 * i));
-  id.Data4[0] = static_cast<unsigned char>((id.Data4[0] & 0x3F) | 0x80);
-  return id;
-}
+CLSID clsidOf(const Text& progId) { return toGuid(classIdOf(progId)); }
 
 std::wstring wide(const Text& text) { return std::wstring(text.begin(), text.end()); }
 
@@ -177,11 +160,17 @@ extern "C" HRESULT STDAPICALLTYPE DllRegisterServer() {
         setValue(HKEY_CLASSES_ROOT, clsidKey + L"\\InprocServer32", L"ThreadingModel",
                  L"Apartment");
     if (!ok) return SELFREG_E_CLASS;
+    setValue(HKEY_CLASSES_ROOT, clsidKey + L"\\TypeLib", nullptr, clsidText(toGuid(libraryId())));
   }
+  // The type library embedded in the DLL, registered under its LIBID.
+  ITypeLib* library = nullptr;
+  if (FAILED(LoadTypeLibEx(path.data(), REGKIND_REGISTER, &library))) return SELFREG_E_TYPELIB;
+  library->Release();
   return S_OK;
 }
 
 extern "C" HRESULT STDAPICALLTYPE DllUnregisterServer() {
+  UnRegisterTypeLib(toGuid(libraryId()), 1, 0, LOCALE_NEUTRAL, SYS_WIN64);
   for (const Text& progId : droqbxml::RegisteredProgIds()) {
     RegDeleteTreeW(HKEY_CLASSES_ROOT, wide(progId).c_str());
     RegDeleteTreeW(HKEY_CLASSES_ROOT, (L"CLSID\\" + clsidText(clsidOf(progId))).c_str());

@@ -38,13 +38,23 @@ lifetime="$(cd "$root/build/windows" && WINEDEBUG=-all wine com-lifetime.exe 2>&
 echo "$lifetime"
 grep -qx 'ALL PASS' <<<"$lifetime" || failed+=(com-lifetime.exe)
 
+# The embedded type library, read back on Windows, describes what the member tables hold.
+count=$((count + 1))
+echo "== com-typelib.exe against the member tables"
+if ! (cd "$root/build/windows" && WINEDEBUG=-all wine com-typelib.exe | tr -d '\r' |
+  diff -u typelib-listing.txt - >"$(dirname "$WINEPREFIX")/typelib.diff"); then
+  head -40 "$(dirname "$WINEPREFIX")/typelib.diff"
+  failed+=(com-typelib.exe)
+fi
+
 # Unregistering removes every class; registering again brings them back.
 count=$((count + 1))
 echo "== regsvr32 /u, then regsvr32"
 (cd "$root/build/windows" && WINEDEBUG=-all wine regsvr32 /u /s DroQbXml.dll)
-if WINEDEBUG=-all wine reg query 'HKCR\DroQbXml.DroEstimate' >/dev/null 2>&1; then
-  failed+=("regsvr32 /u")
-fi
+library="$(grep -m1 -o 'uuid([^)]*)' "$root/build/windows/DroQbXml.idl" | tr -d 'uid()')"
+for key in 'HKCR\DroQbXml.DroEstimate' "HKCR\\TypeLib\\{$library}"; do
+  if WINEDEBUG=-all wine reg query "$key" >/dev/null 2>&1; then failed+=("regsvr32 /u: $key"); fi
+done
 if ! bash "$root/scripts/wine-run.sh" "$root/tests/com/smoke.vbs" >/dev/null; then
   failed+=("regsvr32 again")
 fi
