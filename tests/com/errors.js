@@ -35,5 +35,13 @@ line.Class_Treminate();
 e = caught(function () { return line.PrintOut; });
 check("nothing set", e && hex(e.number), "800A005B");
 
+// The request processor's own failure crosses the wrapper with its HRESULT and message.
+var qb = new ActiveXObject("DroQbXml.DroXmlProcessor");
+qb.API.CompanyFilePath = "Z:\\tmp\\droqbxml-com\\no-such-file.qbw";
+qb.API.ConnectionOpen();
+e = caught(function () { qb.API.SessionBegin(); });
+check("processor error", e && hex(e.number) + " " + e.description,
+      "80040403 Could not open the specified QuickBooks company data file.");
+
 if (failures === 0) WScript.Echo("ALL PASS");
 WScript.Echo("SCRIPT DONE");

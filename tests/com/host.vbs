@@ -1,6 +1,6 @@
 ' The job-costing host's round: the facade, a connection and a session on a company file
 ' of the stand-in (reached as QuickBooks' request processor), queries, a customer, a job,
-' items, an estimate and an invoice sent and read back, collections walked, errors caught.
+' an account, an item, an estimate and an invoice sent and read back, collections walked, errors caught.
 ' The company file is Z:\tmp\droqbxml-com\books.qbw (made by scripts/com-tests.sh).
 Dim failures : failures = 0
 Sub Check(label, actual, expected)
@@ -40,6 +40,15 @@ job.ParentRef.FullName = "Script Builders"
 builder.BuildAddJob job
 response = api.ProcessRequest(builder.XML)
 Check "job added", builder.IsSuccessRs(response, job.RequestID), True
+
+Dim acct : Set acct = CreateObject("DroQbXml.DroAccount")
+acct.Name = "Scripted Sales"
+acct.AccountType = "Income"
+builder.BuildAddAccount acct
+response = api.ProcessRequest(builder.XML)
+Check "account added", builder.IsSuccessRs(response, acct.RequestID), True
+acct.ParseRs response
+Check "account read back", acct.AccountType, "Income"
 
 Dim labour : Set labour = CreateObject("DroQbXml.DroItemNonInventory")
 labour.Name = "Decking"
