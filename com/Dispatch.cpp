@@ -3,8 +3,11 @@
 
 #include <oleauto.h>
 
+#include <cstdint>
 #include <cstring>
 #include <exception>
+#include <map>
+#include <memory>
 #include <new>
 #include <vector>
 
@@ -284,9 +287,20 @@ class EnumVariant final : public Counted<IEnumVARIANT> {
   Ref<Object> enumerator_;
 };
 
+// The vtable side of an object's dual interface: a vtable built from the type library and
+// the object it belongs to (see DualThunks.S).
+struct DualFace {
+  void** vtable;
+  class DispatchObject* owner;
+};
+const struct DualTable* dualTableFor(const Text& className);
+
 class DispatchObject final : public Counted<IDispatch> {
  public:
-  explicit DispatchObject(Ref<Object> object) : object_(std::move(object)) {}
+  explicit DispatchObject(Ref<Object> object) : object_(std::move(object)) {
+    dual_.vtable = nullptr;
+    dual_.owner = this;
+  }
 
   const Ref<Object>& object() const { return object_; }
 
@@ -297,6 +311,18 @@ class DispatchObject final : public Counted<IDispatch> {
       *out = static_cast<IDispatch*>(this);
       AddRef();
       return S_OK;
+    }
+    if (IsEqualIID(iid, toGuid(interfaceIdOf(object_->className())))) {
+      if (dual_.vtable == nullptr) {
+        if (const DualTable* table = dualTableFor(object_->className())) {
+          dual_.vtable = const_cast<void**>(dualVtable(*table));
+        }
+      }
+      if (dual_.vtable != nullptr) {
+        *out = &dual_;
+        AddRef();
+        return S_OK;
+      }
     }
     *out = nullptr;
     return E_NOINTERFACE;
@@ -439,8 +465,113 @@ class DispatchObject final : public Counted<IDispatch> {
     return MemberKind::Get;
   }
 
+  static void* const* dualVtable(const DualTable& table);
+
   Ref<Object> object_;
+  DualFace dual_;
 };
+
+// What the vtable side needs to know of each slot: the member it reaches and how, the kinds
+// of its arguments, and the kind of its result (VT_EMPTY: none).
+struct SlotInfo {
+  MEMBERID memberId = 0;
+  WORD flags = DISPATCH_METHOD;
+  std::vector<VARTYPE> params;
+  VARTYPE result = VT_EMPTY;
+};
+
+struct DualTable {
+  std::vector<void*> vtable;
+  std::vector<SlotInfo> slots;
+};
+
+HRESULT STDMETHODCALLTYPE dualQueryInterface(DualFace* self, REFIID iid, void** out) {
+  return self->owner->QueryInterface(iid, out);
+}
+ULONG STDMETHODCALLTYPE dualAddRef(DualFace* self) { return self->owner->AddRef(); }
+ULONG STDMETHODCALLTYPE dualRelease(DualFace* self) { return self->owner->Release(); }
+HRESULT STDMETHODCALLTYPE dualGetTypeInfoCount(DualFace* self, UINT* count) {
+  return self->owner->GetTypeInfoCount(count);
+}
+HRESULT STDMETHODCALLTYPE dualGetTypeInfo(DualFace* self, UINT index, LCID lcid, ITypeInfo** out) {
+  return self->owner->GetTypeInfo(index, lcid, out);
+}
+HRESULT STDMETHODCALLTYPE dualGetIDsOfNames(DualFace* self, REFIID iid, LPOLESTR* names, UINT count,
+                                            LCID lcid, DISPID* ids) {
+  return self->owner->GetIDsOfNames(iid, names, count, lcid, ids);
+}
+HRESULT STDMETHODCALLTYPE dualInvoke(DualFace* self, DISPID id, REFIID iid, LCID lcid, WORD flags,
+                                     DISPPARAMS* params, VARIANT* result, EXCEPINFO* info,
+                                     UINT* argumentError) {
+  return self->owner->Invoke(id, iid, lcid, flags, params, result, info, argumentError);
+}
+
+extern "C" char droqbxml_dual_thunks[];
+constexpr size_t kThunks = 1024;
+constexpr size_t kThunkSize = 16;
+
+// The vtable side of a class's dual interface as the type library describes it; nothing
+// when the library does not describe the class.
+const DualTable* dualTableFor(const Text& className) {
+  static std::map<Text, std::unique_ptr<DualTable>> tables;
+  const auto known = tables.find(className);
+  if (known != tables.end()) return known->second.get();
+  auto& entry = tables[className];
+  ITypeLib* library = ownLibrary();
+  ITypeInfo* dispatch = nullptr;
+  ITypeInfo* vtable = nullptr;
+  HREFTYPE reference = 0;
+  TYPEATTR* attributes = nullptr;
+  if (library == nullptr ||
+      FAILED(library->GetTypeInfoOfGuid(toGuid(interfaceIdOf(className)), &dispatch)) ||
+      FAILED(dispatch->GetRefTypeOfImplType(static_cast<UINT>(-1), &reference)) ||
+      FAILED(dispatch->GetRefTypeInfo(reference, &vtable)) ||
+      FAILED(vtable->GetTypeAttr(&attributes))) {
+    if (dispatch != nullptr) dispatch->Release();
+    return nullptr;
+  }
+  auto table = std::make_unique<DualTable>();
+  for (WORD f = 0; f < attributes->cFuncs; ++f) {
+    FUNCDESC* func = nullptr;
+    if (FAILED(vtable->GetFuncDesc(f, &func))) continue;
+    const size_t slot = static_cast<size_t>(func->oVft) / sizeof(void*) - 7;
+    if (slot < kThunks) {
+      if (table->slots.size() <= slot) table->slots.resize(slot + 1);
+      SlotInfo& info = table->slots[slot];
+      info.memberId = func->memid;
+      info.flags = func->invkind == INVOKE_PROPERTYGET      ? DISPATCH_PROPERTYGET
+                   : func->invkind == INVOKE_PROPERTYPUT    ? DISPATCH_PROPERTYPUT
+                   : func->invkind == INVOKE_PROPERTYPUTREF ? DISPATCH_PROPERTYPUTREF
+                                                            : DISPATCH_METHOD;
+      for (SHORT p = 0; p < func->cParams; ++p) {
+        const ELEMDESC& param = func->lprgelemdescParam[p];
+        const bool pointer = param.tdesc.vt == VT_PTR;
+        const VARTYPE type = pointer ? param.tdesc.lptdesc->vt : param.tdesc.vt;
+        if ((param.paramdesc.wParamFlags & PARAMFLAG_FRETVAL) != 0) {
+          info.result = type;
+        } else {
+          info.params.push_back(pointer ? static_cast<VARTYPE>(type | VT_BYREF) : type);
+        }
+      }
+    }
+    vtable->ReleaseFuncDesc(func);
+  }
+  vtable->ReleaseTypeAttr(attributes);
+  vtable->Release();
+  dispatch->Release();
+  table->vtable = {
+      reinterpret_cast<void*>(&dualQueryInterface), reinterpret_cast<void*>(&dualAddRef),
+      reinterpret_cast<void*>(&dualRelease),        reinterpret_cast<void*>(&dualGetTypeInfoCount),
+      reinterpret_cast<void*>(&dualGetTypeInfo),    reinterpret_cast<void*>(&dualGetIDsOfNames),
+      reinterpret_cast<void*>(&dualInvoke)};
+  for (size_t slot = 0; slot < table->slots.size(); ++slot) {
+    table->vtable.push_back(droqbxml_dual_thunks + slot * kThunkSize);
+  }
+  entry = std::move(table);
+  return entry.get();
+}
+
+void* const* DispatchObject::dualVtable(const DualTable& table) { return table.vtable.data(); }
 
 Ref<Object> objectInside(IUnknown* unknown) {
   IDispatch* own = nullptr;
@@ -451,6 +582,130 @@ Ref<Object> objectInside(IUnknown* unknown) {
 }
 
 }  // namespace
+
+// A call through slot `slot` of a dual interface's vtable: the arguments as the caller left
+// them (`arguments[0]` is the interface, then one 8-byte slot each; the first three after it
+// also in `doubles` when they are floating point), made into an IDispatch call of the same
+// member. The result goes where the last argument points; a failure is its HRESULT, with
+// the error information set as for IDispatch callers.
+extern "C" HRESULT droqbxml_dual_call(void* self, int slot, uint64_t* arguments, double* doubles) {
+  auto* face = static_cast<DualFace*>(self);
+  const DualTable* table = dualTableFor(face->owner->object()->className());
+  if (table == nullptr || slot < 0 || static_cast<size_t>(slot) >= table->slots.size()) {
+    return E_NOTIMPL;
+  }
+  const SlotInfo& info = table->slots[static_cast<size_t>(slot)];
+  const size_t count = info.params.size();
+  std::vector<VARIANT> values(count);
+  for (size_t p = 0; p < count; ++p) {
+    const uint64_t raw = arguments[p + 1];
+    VARIANT& value = values[count - 1 - p];  // IDispatch takes them last to first
+    VariantInit(&value);
+    switch (info.params[p]) {
+      case VT_BSTR:
+        V_VT(&value) = VT_BSTR;
+        V_BSTR(&value) = reinterpret_cast<BSTR>(raw);
+        break;
+      case VT_BOOL:
+        V_VT(&value) = VT_BOOL;
+        V_BOOL(&value) = static_cast<VARIANT_BOOL>(raw & 0xFFFF);
+        break;
+      case VT_I2:
+        V_VT(&value) = VT_I2;
+        V_I2(&value) = static_cast<SHORT>(raw & 0xFFFF);
+        break;
+      case VT_I4:
+        V_VT(&value) = VT_I4;
+        V_I4(&value) = static_cast<LONG>(raw & 0xFFFFFFFF);
+        break;
+      case VT_R8:
+        V_VT(&value) = VT_R8;
+        if (p < 3) {
+          V_R8(&value) = doubles[p];
+        } else {
+          std::memcpy(&V_R8(&value), &arguments[p + 1], sizeof(double));
+        }
+        break;
+      case VT_DISPATCH:
+        V_VT(&value) = VT_DISPATCH;
+        V_DISPATCH(&value) = reinterpret_cast<IDispatch*>(raw);
+        break;
+      case VT_UNKNOWN:
+        V_VT(&value) = VT_UNKNOWN;
+        V_UNKNOWN(&value) = reinterpret_cast<IUnknown*>(raw);
+        break;
+      case VT_VARIANT:  // a VARIANT by value arrives as a pointer to the caller's copy
+        std::memcpy(&value, reinterpret_cast<const VARIANT*>(raw), sizeof(VARIANT));
+        break;
+      default:  // by reference: the caller's own storage
+        V_VT(&value) = static_cast<VARTYPE>(VT_VARIANT | VT_BYREF);
+        V_VARIANTREF(&value) = reinterpret_cast<VARIANT*>(raw);
+        break;
+    }
+  }
+  DISPID put = DISPID_PROPERTYPUT;
+  const bool isPut = (info.flags & (DISPATCH_PROPERTYPUT | DISPATCH_PROPERTYPUTREF)) != 0;
+  DISPPARAMS params{values.data(), isPut ? &put : nullptr, static_cast<UINT>(count),
+                    isPut ? 1u : 0u};
+  VARIANT result;
+  VariantInit(&result);
+  EXCEPINFO exception{};
+  const HRESULT called = face->owner->Invoke(info.memberId, IID_NULL, LOCALE_USER_DEFAULT,
+                                             info.flags, &params, &result, &exception, nullptr);
+  // The arguments were the caller's: nothing of theirs is freed here.
+  if (called == DISP_E_EXCEPTION) {
+    SysFreeString(exception.bstrSource);
+    SysFreeString(exception.bstrDescription);
+    SysFreeString(exception.bstrHelpFile);
+    VariantClear(&result);
+    return exception.scode;
+  }
+  if (FAILED(called) || info.result == VT_EMPTY) {
+    VariantClear(&result);
+    return called;
+  }
+  void* out = reinterpret_cast<void*>(arguments[count + 1]);
+  if (out == nullptr) {
+    VariantClear(&result);
+    return E_POINTER;
+  }
+  if (info.result == VT_VARIANT) {
+    std::memcpy(out, &result, sizeof(VARIANT));
+    return S_OK;
+  }
+  VARIANT converted;
+  VariantInit(&converted);
+  const HRESULT changed = VariantChangeType(&converted, &result, 0, info.result);
+  VariantClear(&result);
+  if (FAILED(changed)) return changed;
+  switch (info.result) {
+    case VT_BSTR:
+      *static_cast<BSTR*>(out) = V_BSTR(&converted);
+      break;
+    case VT_BOOL:
+      *static_cast<VARIANT_BOOL*>(out) = V_BOOL(&converted);
+      break;
+    case VT_I2:
+      *static_cast<SHORT*>(out) = V_I2(&converted);
+      break;
+    case VT_I4:
+      *static_cast<LONG*>(out) = V_I4(&converted);
+      break;
+    case VT_R8:
+      *static_cast<double*>(out) = V_R8(&converted);
+      break;
+    case VT_DISPATCH:
+      *static_cast<IDispatch**>(out) = V_DISPATCH(&converted);
+      break;
+    case VT_UNKNOWN:
+      *static_cast<IUnknown**>(out) = V_UNKNOWN(&converted);
+      break;
+    default:
+      VariantClear(&converted);
+      return DISP_E_TYPEMISMATCH;
+  }
+  return S_OK;
+}
 
 GUID toGuid(const Guid& guid) {
   GUID out;

@@ -31,12 +31,14 @@ for script in "$root"/tests/com/*.vbs "$root"/tests/com/*.js; do
     failed+=("${script#$root/} (objects left)")
   fi
 done
-# The server's lifetime, from a C++ client.
-count=$((count + 1))
-echo "== com-lifetime.exe"
-lifetime="$(cd "$root/build/windows" && WINEDEBUG=-all wine com-lifetime.exe 2>&1 | tr -d '\r')" || true
-echo "$lifetime"
-grep -qx 'ALL PASS' <<<"$lifetime" || failed+=(com-lifetime.exe)
+# C++ clients: the server's lifetime, and early binding through the dual interfaces.
+for client in com-lifetime.exe com-dual.exe; do
+  count=$((count + 1))
+  echo "== $client"
+  said="$(cd "$root/build/windows" && WINEDEBUG=-all timeout 60 wine "$client" 2>&1 | tr -d '\r')" || true
+  echo "$said"
+  grep -qx 'ALL PASS' <<<"$said" || failed+=("$client")
+done
 
 # The embedded type library, read back on Windows, describes what the member tables hold.
 count=$((count + 1))
