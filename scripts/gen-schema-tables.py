@@ -1,459 +1,240 @@
 #!/usr/bin/env python3
 """Writes simulator/schema/SchemaTables.inc, the stand-in's compiled-in qbXML 13.0 tables.
 
-Reads the detailed element order (children in order with cardinality, choices, flattened
-groups and leaf types) and turns every aggregate the stand-in reads or writes into
-constexpr rows: particles (elements, sequences, choices with min/max), leaf value types,
-enum values and attributes. A reference written {...} takes, in this order: the file's
-own top-level definition of that name, a definition written below from the validator
-schema, an inline definition of the same name elsewhere in the file, GenericListRef
-content (ListID?, FullName?) for names ending in "Ref", AddressData for ShipAddress and
-BillAddress; anything else is marked "content not checked". Run by hand when the element
-order changes:
+Reads Intuit's qbXML 13.0 validator schemas (qbxmlops130.xsd and the three files it
+includes) and turns the request side of a document into constexpr rows: every aggregate
+reachable from QBXML through SignonMsgsRq, QBXMLMsgsRq and QBXMLSubscriptionMsgsRq as a
+tree of particles (elements, sequences, choices with min/max, groups spliced in), leaf value
+types with their maximum lengths, enum values, bounds and defaults, and attributes. The
+Ret and Rs aggregates the stand-in writes are added so that responses follow schema order.
+The qbXML version that introduced a child comes from the version-tagged element order
+(qbxml130_children_with_version_tags.txt). Run by hand when the schemas change:
 
-    scripts/gen-schema-tables.py [path/to/qbxml130_detailed.txt]
+    scripts/gen-schema-tables.py [path/to/qbxml/folder]
 
 Standard library only. The output is committed; the build never needs the input.
 """
 
-import ast
 import os
 import re
 import sys
 import textwrap
+import xml.etree.ElementTree as ET
 
 REPO = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
-DEFAULT_INPUT = os.path.join(REPO, "..", "shared", "qbxml", "element-order",
-                             "qbxml130_detailed.txt")
+DEFAULT_INPUT = os.path.join(REPO, "..", "shared", "qbxml")
 OUTPUT = os.path.join(REPO, "simulator", "schema", "SchemaTables.inc")
 UNBOUNDED = 0xFFFF
+XSD = "{http://www.w3.org/2001/XMLSchema}"
 
-# The requests the stand-in answers, in the order the envelope lists them.
+# Aggregates the stand-in writes in its responses, looked up by name for their child order.
 ITEM_KINDS = ["NonInventory", "Service", "OtherCharge", "Inventory", "Discount", "Subtotal",
               "Group", "Payment", "SalesTax", "SalesTaxGroup"]
-SUPPORTED_REQUESTS = (
-    ["CustomerAddRq", "CustomerQueryRq", "AccountAddRq", "AccountQueryRq"]
-    + [f"Item{kind}AddRq" for kind in ITEM_KINDS]
-    + [f"Item{kind}QueryRq" for kind in ITEM_KINDS]
-    + ["ItemQueryRq", "PayrollItemWageQueryRq", "EstimateAddRq", "EstimateQueryRq",
-       "InvoiceAddRq", "InvoiceQueryRq"])
-
-# Aggregates the detailed order leaves out, written in its own notation from the qbXML 13.0
-# validator schema: the envelope, the add wrappers (the add aggregate, then any number of
-# IncludeRetElement), PayrollItemWageQueryRq (the plain ListQuery group), and the contents
-# of a few small aggregates that requests carry and the detailed order only names.
-ADD_WRAPPER = """{name}Rq attrs=[('requestID', 'optional')]
-  {name} {{...}}
-  IncludeRetElement* : STRTYPE(50)
-"""
-
-EXPLICIT = """
-QBXML
-  QBXMLMsgsRq {...}
-
-QBXMLMsgsRq attrs=[('oldMessageSetID', 'optional'), ('newMessageSetID', 'optional'), \
-('responseData', 'optional'), ('onError', 'required')]
-  CHOICE* {
-""" + "    | or\n".join(f"    {request} {{...}}\n" for request in SUPPORTED_REQUESTS) + """\
-  }
-
-PayrollItemWageQueryRq attrs=[('requestID', 'optional'), ('metaData', 'optional')]
-  CHOICE? {
-    ListID+ : IDTYPE
-    | or
-    FullName+ : STRTYPE
-    | or
-    <group ListFilter>
-      MaxReturned? : INTTYPE
-      ActiveStatus? : ENUMTYPE[ActiveOnly|InactiveOnly|All]
-      FromModifiedDate? : DATETIMETYPE
-      ToModifiedDate? : DATETIMETYPE
-      CHOICE? {
-        NameFilter {
-          MatchCriterion : ENUMTYPE[StartsWith|Contains|EndsWith]
-          Name : STRTYPE
-        }
-        | or
-        NameRangeFilter {
-          FromName? : STRTYPE
-          ToName? : STRTYPE
-        }
-      }
-  }
-  IncludeRetElement* : STRTYPE(50)
-
-AdditionalContactRef
-  ContactName : STRTYPE(40)
-  ContactValue : STRTYPE(255)
-
-BarCode
-  BarCodeValue? : STRTYPE(50)
-  AssignEvenIfUsed? : BOOLTYPE
-  AllowOverride? : BOOLTYPE
-
-DataExt
-  OwnerID : GUIDTYPE
-  DataExtName : STRTYPE(31)
-  DataExtValue : STRTYPE
-
-ShipToAddress
-  Name : STRTYPE(41)
-  Addr1? : STRTYPE(41)
-  Addr2? : STRTYPE(41)
-  Addr3? : STRTYPE(41)
-  Addr4? : STRTYPE(41)
-  Addr5? : STRTYPE(41)
-  City? : STRTYPE(31)
-  State? : STRTYPE(21)
-  PostalCode? : STRTYPE(13)
-  Country? : STRTYPE(31)
-  Note? : STRTYPE(41)
-  DefaultShipTo? : BOOLTYPE
-
-TotalBalanceFilter
-  Operator : ENUMTYPE[LessThan|LessThanEqual|Equal|GreaterThan|GreaterThanEqual]
-  Amount : AMTTYPE
-
-CurrencyFilter
-  CHOICE {
-    ListID+ : IDTYPE
-    | or
-    FullName+ : STRTYPE(64)
-  }
-
-ClassFilter
-  CHOICE {
-    ListID+ : IDTYPE
-    | or
-    FullName+ : STRTYPE
-    | or
-    ListIDWithChildren : IDTYPE
-    | or
-    FullNameWithChildren : STRTYPE
-  }
-
-AccountFilter
-  CHOICE {
-    ListID+ : IDTYPE
-    | or
-    FullName+ : STRTYPE
-    | or
-    ListIDWithChildren : IDTYPE
-    | or
-    FullNameWithChildren : STRTYPE
-  }
-
-RefNumberFilter
-  MatchCriterion : ENUMTYPE[StartsWith|Contains|EndsWith]
-  RefNumber : STRTYPE
-
-RefNumberRangeFilter
-  FromRefNumber? : STRTYPE
-  ToRefNumber? : STRTYPE
-"""
-
-# Query wrappers with the same content and attributes as one the detailed order spells
-# out: the item queries use the ListQueryWithOwnerIDAndClass group (as ItemServiceQueryRq)
-# or the ListQueryWithOwnerID group (as ItemQueryRq).
-SAME_AS = {
-    "ItemNonInventoryQueryRq": "ItemServiceQueryRq",
-    "ItemOtherChargeQueryRq": "ItemServiceQueryRq",
-    "ItemInventoryQueryRq": "ItemServiceQueryRq",
-    "ItemDiscountQueryRq": "ItemServiceQueryRq",
-    "ItemPaymentQueryRq": "ItemServiceQueryRq",
-    "ItemSalesTaxQueryRq": "ItemServiceQueryRq",
-    "ItemSubtotalQueryRq": "ItemQueryRq",
-    "ItemGroupQueryRq": "ItemQueryRq",
-    "ItemSalesTaxGroupQueryRq": "ItemQueryRq",
-}
-
-# Values an attribute may take where the schema restricts it.
-ATTRIBUTE_VALUES = {
-    "onError": ["stopOnError", "continueOnError", "rollbackOnError"],
-    "responseData": ["includeAll", "includeNone"],
-    "metaData": ["NoMetaData", "MetaDataOnly", "MetaDataAndResponseData"],
-    "iterator": ["Start", "Continue", "Stop"],
-}
-
-# Integer leaves with a lower bound (minInclusive) that the detailed order does not show.
-INT_MINIMUM = {"MaxReturned": 1}
-
-# Leaves with a default value, which an empty element takes.
-DEFAULTS = {
-    "ActiveStatus": "ActiveOnly",
-    "DeliveryMethod": "Print",
-    "JobStatus": "None",
-    "PaidStatus": "All",
-    "SalesTaxCountry": "Canada",
-}
-
-GENERIC_LIST_REF = """  ListID? : IDTYPE
-  FullName? : STRTYPE
-"""
-ADDRESS_DATA = """  Addr1? : STRTYPE(41)
-  Addr2? : STRTYPE(41)
-  Addr3? : STRTYPE(41)
-  Addr4? : STRTYPE(41)
-  Addr5? : STRTYPE(41)
-  City? : STRTYPE(31)
-  State? : STRTYPE(21)
-  PostalCode? : STRTYPE(13)
-  Country? : STRTYPE(31)
-  Note? : STRTYPE(41)
-"""
+RESPONSE_ELEMENTS = (["CustomerRet", "AccountRet", "EstimateRet", "InvoiceRet",
+                      "PayrollItemWageRet"] + [f"Item{kind}Ret" for kind in ITEM_KINDS])
+RESPONSE_TYPES = ["CustomerAddRs", "CustomerQueryRs", "EstimateAddRs", "InvoiceAddRs",
+                  "ItemQueryRs"]
 
 VALUE_TYPES = {
     "STRTYPE": "kStr", "IDTYPE": "kId", "BOOLTYPE": "kBool", "DATETYPE": "kDate",
     "DATETIMETYPE": "kDateTime", "INTTYPE": "kInt", "AMTTYPE": "kAmt", "PRICETYPE": "kPrice",
     "QUANTYPE": "kQuan", "PERCENTTYPE": "kPercent", "FLOATTYPE": "kFloat",
-    "GUIDTYPE": "kGuid", "ENUMTYPE": "kEnum",
+    "GUIDTYPE": "kGuid", "ENUMTYPE": "kEnum", "TIMEINTERVALTYPE": "kTimeInterval",
+    "UUIDTYPE": "kStr", "MACROTYPE": "kStr",
 }
 
 
-class ParseError(Exception):
+class SchemaError(Exception):
     pass
 
 
-# ---- reading the notation -------------------------------------------------------------
-
-CARD = r"(\?|\*|\+|\{\d+\.\.\d+\})?"
-RE_HEADER = re.compile(r"^(\w+)(?: attrs=(\[.*\]))?$")
-RE_GROUP = re.compile(r"^<group (\w+)>$")
-RE_CHOICE = re.compile(r"^CHOICE" + CARD + r" \{$")
-RE_INLINE = re.compile(r"^(\w+)" + CARD + r"(?: @(\[.*?\]))? \{$")
-RE_REF = re.compile(r"^(\w+)" + CARD + r" \{\.\.\.\}$")
-RE_LEAF = re.compile(r"^(\w+)" + CARD + r" : (\w+)(?:\((\d+)\)|\[([^\]]*)\])?$")
+def occurs(node):
+    low = int(node.get("minOccurs", "1"))
+    high = node.get("maxOccurs", "1")
+    return low, UNBOUNDED if high == "unbounded" else int(high)
 
 
-def cardinality(text):
-    if not text:
-        return 1, 1
-    if text == "?":
-        return 0, 1
-    if text == "*":
-        return 0, UNBOUNDED
-    if text == "+":
-        return 1, UNBOUNDED
-    low, high = re.match(r"\{(\d+)\.\.(\d+)\}", text).groups()
-    return int(low), int(high)
-
-
-def indent_of(line):
-    return len(line) - len(line.lstrip(" "))
-
-
-class Reader:
-    """Reads definitions: name -> (attributes, items). Items are tuples:
-    ("leaf", name, min, max, type, length, enums), ("ref", name, min, max),
-    ("inline", name, min, max, attributes, items), ("choice", min, max, [branch items]),
-    ("group", name, items)."""
-
-    def __init__(self, text, source):
-        self.lines = [line.rstrip() for line in text.split("\n")]
-        self.source = source
-        self.pos = 0
-
-    def fail(self, message):
-        raise ParseError(f"{self.source}:{self.pos + 1}: {message}: {self.lines[self.pos]!r}")
-
-    def definitions(self):
-        result = []
-        while self.pos < len(self.lines):
-            line = self.lines[self.pos]
-            if not line.strip():
-                self.pos += 1
+def read_version_tags(path):
+    """aggregate -> {child: version times ten} from 'Agg: A, B(v2.1)[not QBD], ...' lines."""
+    tags = {}
+    with open(path, encoding="utf-8") as handle:
+        for line in handle:
+            if ":" not in line:
                 continue
-            if indent_of(line):
-                self.fail("indented line outside a definition")
-            match = RE_HEADER.match(line)
-            if not match:
-                self.fail("not a definition header")
-            name, attrs = match.groups()
-            attributes = []
-            for attribute, use in (ast.literal_eval(attrs) if attrs else []):
-                attributes.append((attribute, use == "required"))
-            self.pos += 1
-            result.append((name, attributes, self.items(2)))
-        return result
-
-    def items(self, indent):
-        """Items at exactly `indent` until a line with a smaller indent or a separator."""
-        items = []
-        while self.pos < len(self.lines):
-            line = self.lines[self.pos]
-            if not line.strip():
-                break
-            here = indent_of(line)
-            if here < indent:
-                break
-            if here > indent:
-                self.fail("unexpected indent")
-            body = line.strip()
-            if body in ("}", "| or"):
-                break
-            items.append(self.item(body, indent))
-        return items
-
-    def closing(self, indent):
-        if self.pos >= len(self.lines) or self.lines[self.pos] != " " * indent + "}":
-            self.fail("expected a closing brace")
-        self.pos += 1
-
-    def item(self, body, indent):
-        match = RE_GROUP.match(body)
-        if match:
-            self.pos += 1
-            return ("group", match.group(1), self.items(indent + 2))
-        match = RE_CHOICE.match(body)
-        if match:
-            low, high = cardinality(match.group(1))
-            self.pos += 1
-            branches = [self.items(indent + 2)]
-            while self.lines[self.pos] == " " * (indent + 2) + "| or":
-                self.pos += 1
-                branches.append(self.items(indent + 2))
-            self.closing(indent)
-            return ("choice", low, high, branches)
-        match = RE_INLINE.match(body)
-        if match:
-            name, card, attrs = match.groups()
-            low, high = cardinality(card)
-            attributes = [(a, False) for a in ast.literal_eval(attrs)] if attrs else []
-            self.pos += 1
-            items = self.items(indent + 2)
-            self.closing(indent)
-            return ("inline", name, low, high, attributes, items)
-        match = RE_REF.match(body)
-        if match:
-            low, high = cardinality(match.group(2))
-            self.pos += 1
-            return ("ref", match.group(1), low, high)
-        match = RE_LEAF.match(body)
-        if match:
-            name, card, type_name, length, enums = match.groups()
-            if type_name not in VALUE_TYPES:
-                self.fail(f"unknown value type {type_name}")
-            low, high = cardinality(card)
-            self.pos += 1
-            return ("leaf", name, low, high, type_name, int(length or 0),
-                    enums.split("|") if enums is not None else [])
-        self.fail("unrecognised line")
-        return None
-
-
-# ---- resolving names ------------------------------------------------------------------
+            aggregate, children = line.split(":", 1)
+            for child in children.split(","):
+                match = re.match(r"\s*(\w+)\(v(\d+)\.(\d+)\)", child)
+                if match:
+                    tags.setdefault(aggregate.strip(), {})[match.group(1)] = (
+                        int(match.group(2)) * 10 + int(match.group(3)))
+    return tags
 
 
 class Schema:
-    def __init__(self, detailed_text, source):
-        detailed = Reader(detailed_text, source).definitions()
-        wrappers = "\n".join(ADD_WRAPPER.format(name=request[:-2])
-                              for request in SUPPORTED_REQUESTS if request.endswith("AddRq"))
-        explicit = Reader(EXPLICIT + "\n" + wrappers, "explicit").definitions()
-        self.top = {}          # name -> (attributes, items): definitions in the file
-        self.inline = {}       # name -> items: first inline definition in the file
-        self.explicit = {}     # name -> (attributes, items): written from the schema above
-        for name, attributes, items in detailed:
-            self.top.setdefault(name, (attributes, items))
-            self.collect_inline(items)
-        for name, attributes, items in explicit:
-            if name in self.top:
-                continue  # the file's own definition wins
-            self.explicit[name] = (attributes, items)
-        for name, model in SAME_AS.items():
-            if name not in self.top:
-                self.explicit[name] = self.top[model]
-        self.unchecked = set()
+    """The global declarations of the four schema files."""
 
-    def collect_inline(self, items):
-        for item in items:
-            if item[0] == "inline":
-                self.inline.setdefault(item[1], item[5])
-                self.collect_inline(item[5])
-            elif item[0] == "group":
-                self.collect_inline(item[2])
-            elif item[0] == "choice":
-                for branch in item[3]:
-                    self.collect_inline(branch)
-
-    def content_of(self, name):
-        """(attributes, items) for a {...} reference, or None when unknown."""
-        if name in self.top:
-            return self.top[name]
-        if name in self.explicit:
-            return self.explicit[name]
-        if name in self.inline:
-            return [], self.inline[name]
-        if name.endswith("Ref"):
-            return [], Reader(GENERIC_LIST_REF, "GenericListRef").items(2)
-        if name in ("ShipAddress", "BillAddress"):
-            return [], Reader(ADDRESS_DATA, "AddressData").items(2)
-        return None
-
-
-# ---- flattening into particles --------------------------------------------------------
+    def __init__(self, folder):
+        self.elements, self.complex_types, self.simple_types, self.groups = {}, {}, {}, {}
+        for name in ("qbxmltypes130.xsd", "qbxml130.xsd", "qbxmlso130.xsd", "qbxmlops130.xsd"):
+            root = ET.parse(os.path.join(folder, "xsd", name)).getroot()
+            for node in root:
+                kind = {XSD + "element": self.elements, XSD + "complexType": self.complex_types,
+                        XSD + "simpleType": self.simple_types,
+                        XSD + "group": self.groups}.get(node.tag)
+                if kind is not None:
+                    kind[node.get("name")] = node
 
 
 class Builder:
-    """Turns definitions into aggregates (name, content key, attributes) and contents
-    (lists of particle rows), sharing identical contents."""
+    """Turns declarations into aggregates (name, content key, attributes) and contents
+    (particle trees), sharing identical contents."""
 
-    def __init__(self, schema):
+    def __init__(self, schema, tags):
         self.schema = schema
-        self.aggregates = {}   # (name, content key) -> attributes
+        self.tags = tags
+        self.aggregates = {}   # aggregate key -> (name, attributes)
         self.contents = {}     # content key -> particle tree
         self.order = []        # aggregate keys in first-seen order
+        self.memo = {}         # (declaring node, name) -> aggregate key
         self.resolving = set()
 
-    def aggregate(self, name, attributes, items):
-        if name in self.resolving:
-            raise ParseError(f"{name} contains itself")
-        self.resolving.add(name)
-        tree = ("seq", 1, 1, self.sequence(items))
-        self.resolving.discard(name)
+    # ---- simple types -----------------------------------------------------------------
+
+    def simple_value(self, node, default):
+        """A leaf's value description from a simpleType or a type name."""
+        base, length, enums, low, high = None, 0, [], None, None
+        if isinstance(node, str):
+            base = node
+        else:
+            restriction = node.find(XSD + "restriction")
+            if restriction is None:
+                raise SchemaError("a simple type that is not a restriction")
+            base = restriction.get("base")
+            for facet in restriction:
+                value = facet.get("value")
+                if facet.tag == XSD + "maxLength":
+                    length = int(value)
+                elif facet.tag == XSD + "enumeration":
+                    enums.append(value)
+                elif facet.tag == XSD + "minInclusive":
+                    low = int(value)
+                elif facet.tag == XSD + "maxInclusive":
+                    high = int(value)
+        if base not in VALUE_TYPES:
+            raise SchemaError(f"unknown value type {base}")
+        type_name = "ENUMTYPE" if enums else base
+        if type_name == "IDTYPE":
+            length = 0  # the type itself holds 36
+        return ("value", type_name, length, tuple(enums), low, high, default, False)
+
+    # ---- complex content --------------------------------------------------------------
+
+    def attributes_of(self, complex_type):
+        result = []
+        holder = complex_type
+        extension = complex_type.find(f"{XSD}simpleContent/{XSD}extension")
+        if extension is not None:
+            holder = extension
+        for attribute in holder.findall(XSD + "attribute"):
+            enums = [e.get("value") for e in attribute.iter(XSD + "enumeration")]
+            result.append((attribute.get("name"), attribute.get("use") == "required",
+                           tuple(enums)))
+        return tuple(result)
+
+    def model(self, node, low=1, high=1):
+        """A particle tree for a sequence, choice, group reference or element."""
+        if node.tag == XSD + "element":
+            return self.element(node)
+        if node.tag == XSD + "group":
+            group = self.schema.groups[node.get("ref")]
+            inner = next(child for child in group if child.tag in (XSD + "sequence",
+                                                                   XSD + "choice"))
+            return self.model(inner, *occurs(node))
+        if node.tag not in (XSD + "sequence", XSD + "choice"):
+            raise SchemaError(f"unexpected {node.tag}")
+        if low == 1 and high == 1:
+            low, high = occurs(node)
+        children = []
+        for child in node:
+            if child.tag not in (XSD + "element", XSD + "group", XSD + "sequence",
+                                 XSD + "choice"):
+                continue
+            particle = self.model(child)
+            if node.tag == XSD + "sequence" and particle[0] == "seq" and particle[1:3] == (1, 1):
+                children.extend(particle[3])  # a plain sequence within a sequence
+            elif (node.tag == XSD + "choice" and particle[0] == "seq" and len(particle[3]) == 1
+                  and particle[1:3] == (1, 1) and particle[3][0][0] == "elem"):
+                children.append(particle[3][0])
+            else:
+                children.append(particle)
+        return ("seq" if node.tag == XSD + "sequence" else "choice", low, high, children)
+
+    def element(self, node):
+        low, high = occurs(node)
+        if node.get("ref"):
+            name = node.get("ref")
+            declaration = self.schema.elements[name]
+        else:
+            name = node.get("name")
+            declaration = node
+        return ("elem", name, low, high, self.content_of(name, declaration))
+
+    def content_of(self, name, declaration):
+        default = declaration.get("default")
+        type_name = declaration.get("type")
+        if type_name in self.schema.complex_types:
+            return ("aggregate", self.aggregate(name, self.schema.complex_types[type_name]))
+        if type_name in self.schema.simple_types or type_name in VALUE_TYPES:
+            return self.simple_value(type_name, default)
+        simple = declaration.find(XSD + "simpleType")
+        if simple is not None:
+            return self.simple_value(simple, default)
+        complex_type = declaration.find(XSD + "complexType")
+        if complex_type is None:
+            raise SchemaError(f"{name} has no type")
+        extension = complex_type.find(f"{XSD}simpleContent/{XSD}extension")
+        if extension is not None:
+            value = self.simple_value(extension.get("base"), default)
+            return value[:-1] + (len(self.attributes_of(complex_type)) > 0,)
+        return ("aggregate", self.aggregate(name, complex_type))
+
+    def aggregate(self, name, complex_type, content=None):
+        memo_key = (id(complex_type), name)
+        if memo_key in self.memo:
+            return self.memo[memo_key]
+        if memo_key in self.resolving:
+            raise SchemaError(f"{name} contains itself")
+        self.resolving.add(memo_key)
+        if content is None:
+            content = next((child for child in complex_type
+                            if child.tag in (XSD + "sequence", XSD + "choice", XSD + "group")),
+                           None)
+        tree = ("seq", 1, 1, []) if content is None else self.model(content)
+        if tree[0] != "seq" or tree[1:3] != (1, 1):
+            tree = ("seq", 1, 1, [tree])
+        tree = self.tagged(name, tree)
+        self.resolving.discard(memo_key)
         key = repr(tree)
         self.contents.setdefault(key, tree)
-        aggregate_key = (name, key)
+        attributes = self.attributes_of(complex_type)
+        aggregate_key = (name, key, repr(attributes))
         if aggregate_key not in self.aggregates:
-            self.aggregates[aggregate_key] = attributes
+            self.aggregates[aggregate_key] = (name, attributes)
             self.order.append(aggregate_key)
+        self.memo[memo_key] = aggregate_key
         return aggregate_key
 
-    def sequence(self, items):
-        particles = []
-        for item in items:
-            if item[0] == "group":
-                particles.extend(self.sequence(item[2]))
-            else:
-                particles.append(self.particle(item))
-        return particles
+    def tagged(self, aggregate, tree):
+        """The tree with the version that introduced each child of `aggregate` on it."""
+        versions = self.tags.get(aggregate)
+        if not versions:
+            return tree
 
-    def particle(self, item):
-        kind = item[0]
-        if kind == "leaf":
-            _, name, low, high, type_name, length, enums = item
-            return ("elem", name, low, high, ("value", type_name, length, tuple(enums),
-                                              INT_MINIMUM.get(name), DEFAULTS.get(name)))
-        if kind == "choice":
-            _, low, high, branches = item
-            rows = []
-            for branch in branches:
-                flat = self.sequence(branch)
-                rows.append(flat[0] if len(flat) == 1 and flat[0][0] == "elem"
-                            else ("seq", 1, 1, flat))
-            return ("choice", low, high, rows)
-        if kind == "inline":
-            _, name, low, high, attributes, items = item
-            return ("elem", name, low, high, ("aggregate", self.aggregate(name, attributes,
-                                                                          items)))
-        if kind == "ref":
-            _, name, low, high = item
-            content = self.schema.content_of(name)
-            if content is None:
-                self.schema.unchecked.add(name)
-                return ("elem", name, low, high, ("unchecked",))
-            return ("elem", name, low, high, ("aggregate", self.aggregate(name, *content)))
-        raise ParseError(f"unexpected item {item!r}")
+        def tag(particle):
+            if particle[0] == "elem":
+                return particle + (versions.get(particle[1], 0),)
+            return particle[:3] + ([tag(child) for child in particle[3]],)
+        return tag(tree)
 
 
 # ---- writing C++ ----------------------------------------------------------------------
@@ -463,7 +244,7 @@ def cxx_string(text):
     return '"' + text.replace("\\", "\\\\").replace('"', '\\"') + '"'
 
 
-def write(builder, schema, source_name):
+def write(builder):
     names = sorted(builder.order, key=lambda key: (key[0], builder.order.index(key)))
     index_of = {key: i for i, key in enumerate(names)}
     enum_pool = []
@@ -478,7 +259,7 @@ def write(builder, schema, source_name):
             enum_pool.extend(values)
         return enum_index[values], len(values)
 
-    rows = []          # C++ particle rows
+    rows = []
     content_first = {}
 
     def emit(tree):
@@ -486,58 +267,54 @@ def write(builder, schema, source_name):
         rows.append(None)
         kind = tree[0]
         if kind == "elem":
-            _, name, low, high, content = tree
+            name, low, high, content = tree[1:5]
+            since = tree[5] if len(tree) > 5 else 0
+            head = f"{{P::kElement, {low}, {high}, {at + 1}, {cxx_string(name)}, "
             if content[0] == "value":
-                _, type_name, length, values, minimum, default = content
+                _, type_name, length, values, minimum, maximum, default, macro = content
                 first, count = enums(values)
-                rows[at] = (f"{{P::kElement, {low}, {high}, {at + 1}, {cxx_string(name)}, "
-                            f"C::kValue, -1, V::{VALUE_TYPES[type_name]}, {length}, {first}, "
-                            f"{count}, {minimum if minimum is not None else 0}, "
-                            f"{'true' if minimum is not None else 'false'}, "
-                            f"{cxx_string(default) if default is not None else '{}'}}},")
-            elif content[0] == "aggregate":
-                rows[at] = (f"{{P::kElement, {low}, {high}, {at + 1}, {cxx_string(name)}, "
-                            f"C::kAggregate, {index_of[content[1]]}, V::kStr, 0, 0, 0, 0, "
-                            f"false, {{}}}},")
+                rows[at] = (head + f"C::kValue, -1, V::{VALUE_TYPES[type_name]}, {length}, "
+                            f"{first}, {count}, {minimum if minimum is not None else 0}, "
+                            f"{maximum if maximum is not None else 0}, "
+                            f"{int(minimum is not None) | int(maximum is not None) << 1 | int(macro) << 2}, "
+                            f"{since}, {cxx_string(default) if default is not None else '{}'}}},")
             else:
-                rows[at] = (f"{{P::kElement, {low}, {high}, {at + 1}, {cxx_string(name)}, "
-                            f"C::kUnchecked, -1, V::kStr, 0, 0, 0, 0, false, {{}}}},")
+                rows[at] = (head + f"C::kAggregate, {index_of[content[1]]}, V::kStr, 0, 0, 0, "
+                            f"0, 0, 0, {since}, {{}}}},")
             return
-        _, low, high, children = tree
+        low, high, children = tree[1:4]
         for child in children:
             emit(child)
         label = "P::kSequence" if kind == "seq" else "P::kChoice"
-        rows[at] = (f"{{{label}, {low}, {high}, {len(rows)}, {{}}, C::kUnchecked, -1, "
-                    f"V::kStr, 0, 0, 0, 0, false, {{}}}},")
+        rows[at] = (f"{{{label}, {low}, {high}, {len(rows)}, {{}}, C::kUnchecked, -1, V::kStr, "
+                    f"0, 0, 0, 0, 0, 0, 0, {{}}}},")
 
     for key in names:
         content_key = key[1]
         if content_key not in content_first:
             content_first[content_key] = len(rows)
             emit(builder.contents[content_key])
+    if len(rows) >= 0xFFFF:
+        raise SchemaError(f"{len(rows)} particles do not fit 16-bit indexes")
 
     attribute_rows = []
     aggregate_rows = []
     for key in names:
-        attributes = builder.aggregates[key]
+        name, attributes = builder.aggregates[key]
         first_attribute = len(attribute_rows)
-        for attribute, required in attributes:
-            first, count = enums(ATTRIBUTE_VALUES.get(attribute, []))
+        for attribute, required, values in attributes:
+            first, count = enums(values)
             attribute_rows.append(f"{{{cxx_string(attribute)}, {'true' if required else 'false'}, "
                                   f"{first}, {count}}},")
-        aggregate_rows.append(f"{{{cxx_string(key[0])}, {content_first[key[1]]}, "
+        aggregate_rows.append(f"{{{cxx_string(name)}, {content_first[key[1]]}, "
                               f"{first_attribute}, {len(attributes)}}},")
 
-    unchecked = sorted(schema.unchecked)
     out = []
     out.append("// qbXML 13.0 aggregates for the stand-in's request checks and Ret order.")
-    out.append(f"// Written by scripts/gen-schema-tables.py from {source_name}; do not edit by")
-    out.append("// hand.")
+    out.append("// Written by scripts/gen-schema-tables.py from the qbXML 13.0 validator schemas;")
+    out.append("// do not edit by hand.")
     out.append(f"// {len(aggregate_rows)} aggregates, {len(rows)} particles, "
                f"{len(enum_pool)} enum values.")
-    out.extend(textwrap.wrap("Content not checked (no definition known): " +
-                             (", ".join(unchecked) if unchecked else "none") + ".",
-                             width=97, initial_indent="// ", subsequent_indent="// "))
     out.append("// Included once, by simulator/schema/SchemaModel.cpp, inside")
     out.append("// namespace droqbxml::simulator::internal.")
     out.append("// clang-format off")
@@ -548,8 +325,8 @@ def write(builder, schema, source_name):
     out.append("}};")
     out.append("")
     out.append("// kind, min, max, end (one past its subtree), name, content, aggregate, value")
-    out.append("// type, maximum length, first enum value, enum value count, minimum, has minimum,")
-    out.append("// default")
+    out.append("// type, maximum length, first enum value, enum value count, minimum, maximum,")
+    out.append("// flags (1 minimum, 2 maximum, 4 useMacro), version introduced, default")
     out.append(f"inline constexpr std::array<Particle, {len(rows)}> kParticles{{{{")
     out.extend(f"    {row}" for row in rows)
     out.append("}};")
@@ -567,39 +344,33 @@ def write(builder, schema, source_name):
     out.append("}};")
     out.append("")
     out.append("// clang-format on")
-    return "\n".join(out) + "\n", unchecked
+    return "\n".join(out) + "\n", len(aggregate_rows), len(rows)
 
 
 def main(argv):
-    source = argv[1] if len(argv) > 1 else DEFAULT_INPUT
-    with open(source, encoding="utf-8") as handle:
-        text = handle.read()
-    schema = Schema(text, os.path.basename(source))
-    builder = Builder(schema)
-    for name in ["QBXML", "QBXMLMsgsRq"] + SUPPORTED_REQUESTS:
-        content = schema.content_of(name)
-        if content is None:
-            raise ParseError(f"no definition for {name}")
-        builder.aggregate(name, *content)
-    # Every other aggregate the file defines, so that Ret aggregates have an order.
-    for name, (attributes, items) in schema.top.items():
-        builder.aggregate(name, attributes, items)
-    names = [key[0] for key in builder.order]
-    for name in sorted({name for name in names if names.count(name) > 1}):
-        print(f"note: {name} has more than one definition; lookups by name find the first",
-              file=sys.stderr)
-    output, unchecked = write(builder, schema, os.path.basename(source))
+    folder = argv[1] if len(argv) > 1 else DEFAULT_INPUT
+    schema = Schema(folder)
+    tags = read_version_tags(os.path.join(folder, "element-order",
+                                          "qbxml130_children_with_version_tags.txt"))
+    builder = Builder(schema, tags)
+    # The request side of QBXML: its first sequence (the second is the response's).
+    qbxml = schema.elements["QBXML"].find(XSD + "complexType")
+    builder.aggregate("QBXML", qbxml, qbxml.find(f"{XSD}choice/{XSD}sequence"))
+    for name in RESPONSE_ELEMENTS:
+        builder.element(ET.Element(XSD + "element", ref=name))
+    for name in RESPONSE_TYPES:
+        builder.aggregate(name, schema.complex_types[name + "Type"])
+    output, aggregates, particles = write(builder)
     os.makedirs(os.path.dirname(OUTPUT), exist_ok=True)
     with open(OUTPUT, "w", encoding="utf-8", newline="\n") as handle:
         handle.write(output)
-    print(f"wrote {os.path.relpath(OUTPUT, REPO)}; content not checked: "
-          f"{', '.join(unchecked) or 'none'}")
+    print(f"wrote {os.path.relpath(OUTPUT, REPO)}: {aggregates} aggregates, {particles} particles")
     return 0
 
 
 if __name__ == "__main__":
     try:
         sys.exit(main(sys.argv))
-    except (ParseError, OSError) as error:
-        print(f"gen-schema-tables: {error}", file=sys.stderr)
+    except (SchemaError, OSError, ET.ParseError, KeyError) as error:
+        print(f"gen-schema-tables: {error!r}", file=sys.stderr)
         sys.exit(1)

@@ -1,12 +1,14 @@
 // A qbXML request document as the stand-in reads it: the prolog read by hand (QuickBooks
 // accepts a DOCTYPE without a system literal, which a strict XML parser refuses), the rest
 // parsed by Expat into a small tree, and the whole checked against the qbXML 13.0 schema
-// rules (child order, required children, unknown elements, enum values, date, date-time,
-// boolean and integer formats) for every request the stand-in supports. Every problem is
-// kept with its line and element so that `droqbxml lint` can name it.
+// rules (child order, required children, unknown elements, enum values, value formats,
+// maximum lengths, the elements of the declared qbXML version) for every request type of
+// qbXML 13.0, and against what QuickBooks Desktop refuses although the schema allows it.
+// Every problem is kept with its line and element so that `droqbxml lint` can name it.
 #ifndef DROQBXML_SIMULATOR_REQUESTDOCUMENT_HPP_
 #define DROQBXML_SIMULATOR_REQUESTDOCUMENT_HPP_
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -36,15 +38,30 @@ struct Problem {
   int line = 0;
   std::string element;
   std::string message;
+  // QuickBooks reads the document and refuses only the request holding this value, with
+  // a status (see ValueRefusal); false: it refuses the whole document.
+  bool perRequest = false;
+};
+
+// A value the schema refuses that QuickBooks takes into the request and then answers with
+// an error status: a text longer than its field allows (3070), a number with more digits
+// or decimals than its type has (3040).
+struct ValueRefusal {
+  std::size_t request = 0;  // index of the request among the QBXMLMsgsRq children
+  std::string field;        // the element's name
+  std::string value;
+  std::string_view kind;  // "text", or the number's kind: amount, price, quantity, percentage
 };
 
 struct RequestDocument {
-  std::string qbxmlVersion;  // from <?qbxml version="N.N"?>, or "1.0" from the DOCTYPE
-  XmlNode root;              // the QBXML element
+  std::string qbxmlVersion;            // from <?qbxml version="N.N"?>, or "1.0" from the DOCTYPE
+  XmlNode root;                        // the QBXML element
+  std::vector<ValueRefusal> refusals;  // in document order
 };
 
 struct ReadResult {
-  std::optional<RequestDocument> document;  // present only when there is no problem
+  // Present when every problem is a per-request one (then also listed in refusals).
+  std::optional<RequestDocument> document;
   std::vector<Problem> problems;
 };
 

@@ -1,16 +1,21 @@
 // The stand-in's request processing: a new company's lists, and a document's requests routed
 // to their handlers one by one, each in its own transaction, following the document's
 // onError: stopOnError ends at the first request refused with an error, continueOnError goes
-// on, rollbackOnError QuickBooks refuses as a parse error.
+// on, rollbackOnError QuickBooks refuses as a parse error. A request type the stand-in does
+// not model is answered as QuickBooks answers one it does not support.
 #include "simulator/RequestHandlers.hpp"
 
 #include <array>
+#include <cstddef>
+#include <optional>
 #include <string_view>
+#include <utility>
 
 #include "droqbxml/connection/RequestProcessor.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 #include "simulator/handlers/Clock.hpp"
 #include "simulator/handlers/Handlers.hpp"
+#include "simulator/handlers/Status.hpp"
 #include "simulator/handlers/Store.hpp"
 
 namespace droqbxml::simulator {
@@ -64,6 +69,18 @@ Handler handlerFor(std::string_view request) {
   return nullptr;
 }
 
+// The status of the first value of request `index` that QuickBooks takes in and then
+// refuses (3040, 3070), if any. The handlers check the values they use themselves, in
+// their own order; this catches the rest, so that no such request succeeds.
+std::optional<handlers::Status> valueRefusal(const RequestDocument& document, std::size_t index) {
+  for (const ValueRefusal& refusal : document.refusals) {
+    if (refusal.request != index) continue;
+    if (refusal.kind == "text") return handlers::status::tooLong(refusal.value, refusal.field);
+    return handlers::status::conversion(refusal.kind, refusal.value, refusal.field);
+  }
+  return std::nullopt;
+}
+
 // QuickBooks' answer to a document it will not process: no response at all.
 [[noreturn]] void refuseDocument() {
   raiseError(static_cast<int32_t>(0x80040400u), Text(kRequestProcessorProgId),
@@ -83,20 +100,24 @@ std::string answerRequests(CompanyFile& company, const RequestDocument& document
   if (messages == nullptr) refuseDocument();
   const std::string onError = messages->attribute("onError").value_or("stopOnError");
   if (onError == "rollbackOnError") refuseDocument();
-  for (const XmlNode& request : messages->children) {
-    if (handlerFor(request.name) == nullptr) refuseDocument();
-  }
 
   handlers::Store store(company.db());
   handlers::Context context(company, store, handlers::QbxmlVersion::parse(document.qbxmlVersion));
   std::string answers;
-  for (const XmlNode& request : messages->children) {
+  for (std::size_t index = 0; index < messages->children.size(); ++index) {
+    const XmlNode& request = messages->children[index];
     context.now = handlers::currentTime();
     std::string text;
     bool refused = false;
     try {
-      company.inTransaction(
-          [&] { text = handlers::writeAnswer(handlerFor(request.name)(context, request), store); });
+      const Handler handler = handlerFor(request.name);
+      if (handler == nullptr) throw handlers::Refusal(handlers::status::unsupported());
+      company.inTransaction([&] {
+        text = handlers::writeAnswer(handler(context, request), store);
+        if (auto status = valueRefusal(document, index)) {
+          throw handlers::Refusal(std::move(*status));
+        }
+      });
     } catch (const handlers::Refusal& refusal) {
       context.forgetLookups();
       Answer answer = handlers::answerTo(request);

@@ -1,11 +1,13 @@
 // Reads a request document as QuickBooks does: the prolog by hand (the QBXML DOCTYPE
 // without a system literal, the <?qbxml version?>), then Expat for the rest, with the
 // DOCTYPE replaced by blanks so that line numbers stay right and no DTD ever reaches the
-// parser; then the qbXML 13.0 checks. Size, nesting and element count are bounded.
+// parser; then the qbXML 13.0 checks, in the version the document declares. Size, nesting
+// and element count are bounded.
 #include <expat.h>
 
 #include <algorithm>
 #include <cstddef>
+#include <iterator>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -111,9 +113,16 @@ bool isVersion(std::string_view version) {
          digits(version.substr(point + 1));
 }
 
+// The qbXML versions QuickBooks Desktop answers, up to the 13.0 of the stand-in's tables.
+constexpr std::string_view kKnownVersions[] = {"1.0",  "1.1",  "2.0",  "2.1", "3.0", "4.0",
+                                               "4.1",  "5.0",  "6.0",  "7.0", "8.0", "9.0",
+                                               "10.0", "11.0", "12.0", "13.0"};
+
 // What the hand-read prolog found.
 struct Prolog {
-  std::string version;  // from <?qbxml version?>, else from the DOCTYPE's public identifier
+  std::string version;        // from <?qbxml version?>, else from the DOCTYPE's public identifier
+  std::size_t versionAt = 0;  // where it was declared
+  bool versionFromDoctype = false;
   std::size_t doctypeBegin = 0;
   std::size_t doctypeEnd = 0;   // equal to doctypeBegin when there is no DOCTYPE
   bool versionRefused = false;  // a <?qbxml?> without a usable version was reported
@@ -158,7 +167,11 @@ class PrologReader {
         break;
       }
     }
-    if (prolog_.version.empty()) prolog_.version = doctypeVersion;
+    if (prolog_.version.empty() && !doctypeVersion.empty()) {
+      prolog_.version = doctypeVersion;
+      prolog_.versionAt = prolog_.doctypeBegin;
+      prolog_.versionFromDoctype = true;
+    }
     return prolog_;
   }
 
@@ -209,6 +222,7 @@ class PrologReader {
                     "qbXML version " + internal::quoted(version) + " is not of the form N.N");
     } else {
       prolog_.version = version;
+      prolog_.versionAt = pos_;
     }
   }
 
@@ -473,8 +487,29 @@ ReadResult readRequest(std::string_view utf8Document) {
                  "no qbXML version: a request starts with <?qbxml version=\"N.N\"?> or the "
                  "QBXML DOCTYPE");
   }
-  internal::checkRequestTree(*root, problems);
-  if (problems.empty()) result.document = RequestDocument{prolog.version, std::move(*root)};
+  internal::DeclaredVersion version;
+  if (!prolog.version.empty()) {
+    const auto known = std::find(std::begin(kKnownVersions), std::end(kKnownVersions),
+                                 std::string_view(prolog.version));
+    if (known == std::end(kKnownVersions)) {
+      problems.add(lineAt(utf8Document, prolog.versionAt), "",
+                   "qbXML version " + internal::quoted(prolog.version) +
+                       " is not one QuickBooks Desktop knows (1.0, 1.1, 2.0, 2.1, 3.0, 4.0, 4.1, "
+                       "5.0 and every N.0 up to 13.0)");
+    } else {
+      const std::size_t point = prolog.version.find('.');
+      version = {std::stoi(prolog.version.substr(0, point)) * 10 +
+                     std::stoi(prolog.version.substr(point + 1)),
+                 prolog.version, prolog.versionFromDoctype};
+    }
+  }
+  std::vector<ValueRefusal> refusals;
+  internal::checkRequestTree(*root, version, problems, refusals);
+  const bool readable = std::all_of(result.problems.begin(), result.problems.end(),
+                                    [](const Problem& problem) { return problem.perRequest; });
+  if (readable) {
+    result.document = RequestDocument{prolog.version, std::move(*root), std::move(refusals)};
+  }
   return result;
 }
 

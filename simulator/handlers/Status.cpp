@@ -27,6 +27,11 @@ Status notFound(std::string_view value) {
                     quoted(value) + ") that could not be found in QuickBooks."};
 }
 
+// Intuit's published status codes list 1030, "Unsupported message", with this text.
+Status unsupported() {
+  return error(1030, "This request is not supported by this implementation.");
+}
+
 Status conversion(std::string_view kindWord, std::string_view value, std::string_view field) {
   return error(3040, "There was an error when converting the " + std::string(kindWord) + " " +
                          quoted(value) + " in the field " + quoted(field) + ". ");

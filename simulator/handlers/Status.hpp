@@ -27,6 +27,9 @@ Status ok();
 Status noMatch();
 // 500: a query named a ListID, FullName, TxnID or RefNumber `value` that does not exist.
 Status notFound(std::string_view value);
+// 1030: a request type this QuickBooks does not support (for the stand-in: one it does
+// not model).
+Status unsupported();
 // 3040: a number QuickBooks cannot convert (`kindWord`: amount, price, quantity, percentage).
 Status conversion(std::string_view kindWord, std::string_view value, std::string_view field);
 // 3070: a text longer than its field allows.

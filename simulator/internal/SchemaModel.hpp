@@ -1,7 +1,9 @@
-// The qbXML 13.0 rules the stand-in reads requests with: every aggregate as a tree of
-// particles (elements, sequences, choices, each with its cardinality), leaf value types and
-// attributes, compiled in from simulator/schema/SchemaTables.inc, and for each aggregate
-// the automaton that matches a list of children against its content.
+// The qbXML 13.0 rules the stand-in reads requests with: every aggregate of a request
+// document (and the Ret aggregates the stand-in writes) as a tree of particles (elements,
+// sequences, choices, each with its cardinality), leaf value types with their lengths,
+// bounds and enum values, and attributes, compiled in from
+// simulator/schema/SchemaTables.inc, and for each aggregate the automaton that matches a
+// list of children against its content.
 #ifndef DROQBXML_SIMULATOR_INTERNAL_SCHEMAMODEL_HPP_
 #define DROQBXML_SIMULATOR_INTERNAL_SCHEMAMODEL_HPP_
 
@@ -14,8 +16,8 @@ namespace droqbxml::simulator::internal {
 
 enum class ParticleKind : std::uint8_t { kElement, kSequence, kChoice };
 
-// What an element holds: a value of a leaf type, another aggregate, or content the tables
-// do not describe (accepted as it is).
+// What an element holds: a value of a leaf type or another aggregate (kUnchecked marks
+// sequences and choices, which hold no content of their own).
 enum class ContentKind : std::uint8_t { kValue, kAggregate, kUnchecked };
 
 // The qbXML leaf types (STRTYPE, IDTYPE, BOOLTYPE, ...).
@@ -33,6 +35,7 @@ enum class ValueType : std::uint8_t {
   kFloat,
   kGuid,
   kEnum,
+  kTimeInterval,
 };
 
 inline constexpr std::uint16_t kUnbounded = 0xFFFF;
@@ -48,12 +51,19 @@ struct Particle {
   ContentKind content;      // elements only
   std::int16_t aggregate;   // kAggregate: index of the aggregate in aggregates()
   ValueType type;           // kValue
-  std::uint16_t maxLength;  // STRTYPE(n); 0 when none (not checked: QuickBooks decides)
+  std::uint16_t maxLength;  // STRTYPE(n) in characters; 0 when unbounded
   std::uint16_t firstEnum;  // ENUMTYPE values: a range of enumValues()
   std::uint16_t enumCount;
-  std::int32_t minimum;  // INTTYPE lower bound, when hasMinimum
-  bool hasMinimum;
+  std::int32_t minimum;  // INTTYPE bounds, when the flags say so
+  std::int32_t maximum;
+  std::uint8_t flags;             // kHasMinimum, kHasMaximum, kTakesMacro
+  std::uint8_t since;             // qbXML version that added it, times ten (21: 2.1); 0: all
   std::string_view defaultValue;  // what an empty element stands for; empty when none
+
+  static constexpr std::uint8_t kHasMinimum = 1;
+  static constexpr std::uint8_t kHasMaximum = 2;
+  static constexpr std::uint8_t kTakesMacro = 4;  // a leaf that may carry a useMacro attribute
+  bool has(std::uint8_t flag) const { return (flags & flag) != 0; }
 };
 
 struct AttributeRule {

@@ -1,6 +1,7 @@
 // Checks a request tree against the qbXML 13.0 tables: children matched against each
 // aggregate's content automaton (order, required children, unknown elements, cardinality,
-// choices), attributes, and the lexical form of every leaf value.
+// choices, the declared qbXML version), attributes, the lexical form of every leaf value,
+// and what QuickBooks Desktop refuses although the schema allows it.
 #include "simulator/internal/SchemaCheck.hpp"
 
 #include <algorithm>
@@ -102,6 +103,23 @@ bool isDateTime(std::string_view text) {
   return (text[19] == '+' || text[19] == '-') && isClock(text.substr(20), false);
 }
 
+// [+-]PT, then hours, minutes and seconds, each optional ("PT1H30M"), at least one of them.
+bool isTimeInterval(std::string_view text) {
+  text = withoutSign(text);
+  if (!text.starts_with("PT") || text.size() == 2) return false;
+  std::string_view units = "HMS";
+  for (std::size_t at = 2; at < text.size();) {
+    std::size_t end = at;
+    while (end < text.size() && isDigit(text[end])) ++end;
+    if (end == at || end == text.size()) return false;
+    const std::size_t unit = units.find(text[end]);
+    if (unit == std::string_view::npos) return false;
+    units.remove_prefix(unit + 1);
+    at = end + 1;
+  }
+  return true;
+}
+
 bool isGuid(std::string_view text) {
   if (text == "0") return true;
   static constexpr std::string_view kShape = "{xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx}";
@@ -150,9 +168,16 @@ std::vector<std::string_view> valuesOf(std::uint16_t first, std::uint16_t count)
   return {values.begin(), values.end()};
 }
 
+// "13.0" from 130.
+std::string versionText(int tenths) {
+  return std::to_string(tenths / 10) + "." + std::to_string(tenths % 10);
+}
+
 class TreeChecker {
  public:
-  explicit TreeChecker(ProblemList& problems) : problems_(problems) {}
+  TreeChecker(const DeclaredVersion& version, ProblemList& problems,
+              std::vector<ValueRefusal>& refusals)
+      : version_(version), problems_(problems), refusals_(refusals) {}
 
   void checkRoot(XmlNode& root) {
     path_ = root.name;
@@ -161,6 +186,7 @@ class TreeChecker {
       return;
     }
     checkAggregate(root, findAggregate("QBXML"));
+    checkDesktopEnvelope(root);
   }
 
  private:
@@ -182,6 +208,38 @@ class TreeChecker {
 
   void report(int line, std::string message) { problems_.add(line, path_, std::move(message)); }
 
+  // What the schema allows in the envelope and QuickBooks Desktop's request processor
+  // refuses with its parse error: sign-on messages (QuickBooks Online Edition's),
+  // subscriptions (they go through ProcessSubscription), a document with no QBXMLMsgsRq,
+  // and onError="rollbackOnError".
+  void checkDesktopEnvelope(const XmlNode& root) {
+    bool messages = false;
+    for (const XmlNode& child : root.children) {
+      const Step step(path_, child.name);
+      if (child.name == "SignonMsgsRq") {
+        report(child.line,
+               "QuickBooks Desktop refuses SignonMsgsRq: sign-on messages are for QuickBooks "
+               "Online Edition");
+      } else if (child.name == "QBXMLSubscriptionMsgsRq") {
+        report(child.line,
+               "QuickBooks Desktop refuses QBXMLSubscriptionMsgsRq in a request: subscriptions "
+               "go through ProcessSubscription, not ProcessRequest");
+      } else if (child.name == "QBXMLMsgsRq") {
+        messages = true;
+        if (child.attribute("onError") == "rollbackOnError") {
+          report(child.line,
+                 "QuickBooks Desktop refuses onError 'rollbackOnError' although the schema "
+                 "lists it: use stopOnError or continueOnError");
+        }
+      }
+    }
+    if (!messages && root.children.empty()) {
+      report(root.line,
+             "QuickBooks Desktop refuses a QBXML without QBXMLMsgsRq: it has no "
+             "request to answer");
+    }
+  }
+
   void checkElement(XmlNode& node, const Particle& particle) {
     if (particle.content == ContentKind::kValue) {
       checkLeaf(node, particle);
@@ -192,6 +250,7 @@ class TreeChecker {
 
   void checkLeaf(XmlNode& node, const Particle& leaf) {
     for (const auto& [name, value] : node.attributes) {
+      if (name == "useMacro" && leaf.has(Particle::kTakesMacro)) continue;
       report(node.line, "unknown attribute '" + name + "' on " + node.name);
     }
     for (const XmlNode& child : node.children) {
@@ -201,9 +260,28 @@ class TreeChecker {
     }
     if (auto problem = leafProblem(leaf, node.text)) {
       report(node.line, std::move(*problem));
+    } else if (auto refused = refusedValue(leaf, node.text)) {
+      problems_.add(node.line, path_, std::move(refused->message), true);
+      if (request_ >= 0) {
+        refusals_.push_back(
+            {static_cast<std::size_t>(request_), node.name, node.text, refused->kind});
+      }
     } else if (node.text.empty() && node.children.empty()) {
       node.text = leaf.defaultValue;
     }
+  }
+
+  // An element the declared qbXML version does not have yet.
+  void checkVersion(const XmlNode& child, const XmlNode& parent, const Particle& particle) {
+    if (particle.since <= version_.tenths) return;
+    std::string message = "'" + child.name + "' in " + parent.name + " came with qbXML " +
+                          versionText(particle.since) + "; this document is qbXML " + version_.text;
+    if (version_.fromDoctype) {
+      message +=
+          " (QuickBooks takes the version from the DOCTYPE when there is no "
+          "<?qbxml version?>)";
+    }
+    report(child.line, std::move(message));
   }
 
   void checkAggregate(XmlNode& node, int index) {
@@ -265,8 +343,10 @@ class TreeChecker {
   void checkChildren(XmlNode& node, const ContentAutomaton& automaton) {
     std::vector<int> state;  // empty: before the first child
     int run = 0;             // how many times in a row the current position matched
+    const bool requests = path_ == "QBXML/QBXMLMsgsRq";
     for (XmlNode& child : node.children) {
       if (problems_.full()) return;
+      if (requests) request_ = static_cast<int>(&child - node.children.data());
       const Step step(path_, child.name);
       const std::vector<int> candidates = next(automaton, state);
       std::vector<int> matched = named(automaton, candidates, child.name);
@@ -277,6 +357,7 @@ class TreeChecker {
             run > particle.maxOccurs) {
           report(child.line, tooMany(child.name, node.name, particle.maxOccurs));
         }
+        if (run == 1) checkVersion(child, node, particle);
         state = std::move(matched);
         checkElement(child, particle);
         continue;
@@ -299,6 +380,7 @@ class TreeChecker {
       run = 1;
       checkElement(child, automaton.particleAt(state.front()));
     }
+    if (requests) request_ = -1;
     if (problems_.full()) return;
     const bool complete = state.empty()
                               ? automaton.acceptsEmpty
@@ -319,9 +401,6 @@ class TreeChecker {
   }
 
   static std::string unknown(const std::string& name, const std::string& parent) {
-    if (parent == "QBXMLMsgsRq" && name.size() > 2 && name.ends_with("Rq")) {
-      return "unsupported request '" + name + "'";
-    }
     return "unknown element '" + name + "' in " + parent;
   }
 
@@ -365,13 +444,16 @@ class TreeChecker {
     return false;
   }
 
+  const DeclaredVersion& version_;
   ProblemList& problems_;
+  std::vector<ValueRefusal>& refusals_;
   std::string path_;
+  int request_ = -1;  // index of the request being checked among the QBXMLMsgsRq children
 };
 
 }  // namespace
 
-void ProblemList::add(int line, std::string element, std::string message) {
+void ProblemList::add(int line, std::string element, std::string message, bool perRequest) {
   if (full_) return;
   if (problems_.size() == kLimit) {
     problems_.push_back(
@@ -380,7 +462,7 @@ void ProblemList::add(int line, std::string element, std::string message) {
     full_ = true;
     return;
   }
-  problems_.push_back({line, std::move(element), std::move(message)});
+  problems_.push_back({line, std::move(element), std::move(message), perRequest});
 }
 
 std::string quoted(std::string_view text) {
@@ -420,6 +502,9 @@ std::optional<std::string> valueProblem(ValueType type, std::string_view text) {
     case ValueType::kFloat:
       if (collapsed.empty() || isDecimal(collapsed)) return std::nullopt;
       return quoted(text) + " is not a FLOATTYPE value (a decimal number)";
+    case ValueType::kTimeInterval:
+      if (collapsed.empty() || isTimeInterval(collapsed)) return std::nullopt;
+      return quoted(text) + " is not a TIMEINTERVALTYPE value (PTnHnMnS, e.g. PT1H30M)";
     case ValueType::kGuid:
       if (isGuid(text)) return std::nullopt;
       return quoted(text) +
@@ -449,15 +534,60 @@ std::optional<std::string> leafProblem(const Particle& leaf, std::string_view te
     return quoted(text) + " is not one of: " + listed(values, 16);
   }
   if (auto problem = valueProblem(leaf.type, text)) return problem;
-  if (leaf.hasMinimum && clampedInteger(trimmed(text)) < leaf.minimum) {
+  if (leaf.has(Particle::kHasMinimum) && clampedInteger(trimmed(text)) < leaf.minimum) {
     return quoted(text) + " is less than " + std::to_string(leaf.minimum) + ", the least " +
+           std::string(leaf.name) + " may be";
+  }
+  if (leaf.has(Particle::kHasMaximum) && clampedInteger(trimmed(text)) > leaf.maximum) {
+    return quoted(text) + " is more than " + std::to_string(leaf.maximum) + ", the most " +
            std::string(leaf.name) + " may be";
   }
   return std::nullopt;
 }
 
-void checkRequestTree(XmlNode& root, ProblemList& problems) {
-  TreeChecker(problems).checkRoot(root);
+std::optional<ValueRefusalProblem> refusedValue(const Particle& leaf, std::string_view text) {
+  if (leaf.type == ValueType::kStr) {
+    if (leaf.maxLength == 0 || characterCount(text) <= leaf.maxLength) return std::nullopt;
+    return ValueRefusalProblem{
+        "text", quoted(text) + " has " + std::to_string(characterCount(text)) + " characters; " +
+                    std::string(leaf.name) + " may have at most " + std::to_string(leaf.maxLength) +
+                    " (QuickBooks answers the request with 3070)"};
+  }
+  struct NumberRule {
+    ValueType type;
+    std::string_view kind;
+    std::string_view typeName;
+    std::size_t digits;
+    std::size_t leastDecimals;
+    std::size_t mostDecimals;
+    std::string_view form;
+  };
+  static constexpr std::array<NumberRule, 4> kRules{{
+      {ValueType::kAmt, "amount", "AMTTYPE", 13, 2, 2, "1 to 13 digits, then none or 2 decimals"},
+      {ValueType::kPrice, "price", "PRICETYPE", 10, 1, 5, "1 to 10 digits, then 1 to 5 decimals"},
+      {ValueType::kQuan, "quantity", "QUANTYPE", 10, 1, 5, "1 to 10 digits, then 1 to 5 decimals"},
+      {ValueType::kPercent, "percentage", "PERCENTTYPE", 10, 1, 5,
+       "1 to 10 digits, then 1 to 5 decimals"},
+  }};
+  const auto rule = std::find_if(kRules.begin(), kRules.end(),
+                                 [&](const NumberRule& r) { return r.type == leaf.type; });
+  if (rule == kRules.end() || text.empty()) return std::nullopt;
+  const std::string_view body = withoutSign(text);
+  const std::size_t point = body.find('.');
+  const std::size_t whole = std::min(point, body.size());
+  const std::size_t decimals = point == std::string_view::npos ? 0 : body.size() - point - 1;
+  const bool fits = whole >= 1 && whole <= rule->digits &&
+                    (point == std::string_view::npos ||
+                     (decimals >= rule->leastDecimals && decimals <= rule->mostDecimals));
+  if (fits) return std::nullopt;
+  return ValueRefusalProblem{
+      rule->kind, quoted(text) + " does not fit " + std::string(rule->typeName) + " (" +
+                      std::string(rule->form) + "; QuickBooks answers the request with 3040)"};
+}
+
+void checkRequestTree(XmlNode& root, const DeclaredVersion& version, ProblemList& problems,
+                      std::vector<ValueRefusal>& refusals) {
+  TreeChecker(version, problems, refusals).checkRoot(root);
 }
 
 }  // namespace droqbxml::simulator::internal
