@@ -4,8 +4,11 @@
 
 #include <CLI/CLI.hpp>
 #include <array>
-#include <map>
+#include <chrono>
+#include <cstdio>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "cli/Commands.hpp"
 #include "droqbxml/connection/RequestProcessor.hpp"
@@ -54,14 +57,51 @@ constexpr std::array<Named, 3> kActiveStates{{
     {"all", udAsAll},
 }};
 
+// Makes `option` accept one of the table's names (any case) and store its value; help and
+// errors show the names only.
 template <size_t N>
-std::map<std::string, int32_t> choices(const std::array<Named, N>& table) {
-  std::map<std::string, int32_t> map;
-  for (const auto& entry : table) map.emplace(entry.name, entry.value);
-  return map;
+CLI::Option* named(CLI::Option* option, const std::array<Named, N>& table) {
+  std::vector<std::pair<std::string, int32_t>> pairs;
+  std::string names;
+  for (const auto& entry : table) {
+    pairs.emplace_back(entry.name, entry.value);
+    names += names.empty() ? "" : "|";
+    names += entry.name;
+  }
+  const CLI::Validator validator(
+      [pairs, names](std::string& text) -> std::string {
+        for (const auto& [name, value] : pairs) {
+          if (CLI::detail::to_lower(text) == name) {
+            text = std::to_string(value);
+            return {};
+          }
+        }
+        return "'" + text + "' is not one of " + names;
+      },
+      "");
+  return option->transform(validator)->type_name(names);
 }
 
-const std::map<std::string, bool> kOnOff{{"on", true}, {"off", false}};
+constexpr std::array<Named, 2> kOnOff{{{"on", 1}, {"off", 0}}};
+constexpr std::array<Named, 2> kFormats{{{"xml", 0}, {"json", 1}}};
+
+// A date as qbXML writes it, yyyy-mm-dd, that exists in the calendar.
+const CLI::Validator kQbxmlDate(
+    [](std::string& text) -> std::string {
+      int year = 0;
+      unsigned month = 0;
+      unsigned day = 0;
+      char tail = 0;
+      if (text.size() != 10 || text[4] != '-' || text[7] != '-' ||
+          std::sscanf(text.c_str(), "%4d-%2u-%2u%c", &year, &month, &day, &tail) != 3) {
+        return "not a date of the form yyyy-mm-dd: " + text;
+      }
+      const std::chrono::year_month_day date{std::chrono::year{year}, std::chrono::month{month},
+                                             std::chrono::day{day}};
+      if (!date.ok()) return "no such date: " + text;
+      return {};
+    },
+    "yyyy-mm-dd", "qbXML date");
 
 // The stand-in answers for QuickBooks when asked to through the environment, and wherever
 // the platform has no request processor of its own.
@@ -75,50 +115,79 @@ void selectDefaultProcessor() {
   }
 }
 
-void addConnectionOptions(CLI::App& command, ConnectionOptions& options) {
-  command.add_option("--company", options.company, "Company file to open (full path)");
-}
-
 void addQueryOptions(CLI::App& command, QueryOptions& options) {
-  command.add_option("KIND", options.kind, "What to query")
-      ->required()
-      ->transform(CLI::CheckedTransformer(choices(kEntityKinds), CLI::ignore_case));
+  named(command.add_option("KIND", options.kind, "What to query")->required(), kEntityKinds);
   auto* fullName = command.add_option("--full-name", options.fullName, "One record by full name");
   auto* listId = command.add_option("--list-id", options.listId, "One record by list identifier");
   auto* itemKind =
-      command.add_option("--item-kind", options.itemKind, "Item kind, with item --full-name")
-          ->transform(CLI::CheckedTransformer(choices(kItemKinds), CLI::ignore_case))
-          ->needs(fullName);
-  auto* active = command.add_option("--active", options.active, "Filter by active status")
-                     ->transform(CLI::CheckedTransformer(choices(kActiveStates), CLI::ignore_case));
-  command.add_option("--from", options.from, "Modified on or after this date")->needs(active);
-  command.add_option("--to", options.to, "Modified on or before this date")->needs(active);
+      named(command.add_option("--item-kind", options.itemKind, "Item kind, with item --full-name"),
+            kItemKinds);
+  itemKind->needs(fullName);
+  auto* active = named(command.add_option("--active", options.active, "Filter by active status"),
+                       kActiveStates);
+  command.add_option("--from", options.from, "Modified on or after this date")
+      ->check(kQbxmlDate)
+      ->type_name("DATE")
+      ->needs(active);
+  command.add_option("--to", options.to, "Modified on or before this date")
+      ->check(kQbxmlDate)
+      ->type_name("DATE")
+      ->needs(active);
   fullName->excludes(listId)->excludes(active);
   listId->excludes(active);
-  (void)itemKind;
 }
 
 }  // namespace
 
+constexpr const char* kExitCodes =
+    "Exit codes (every command):\n"
+    "  0  done; every response QuickBooks sent has statusSeverity Info\n"
+    "  1  a response is a warning or an error; lint found problems\n"
+    "  2  usage: bad arguments, an unreadable or empty request document, an existing file\n"
+    "  3  no request processor, no connection or session, a company file that cannot be\n"
+    "     opened, a request QuickBooks could not parse or a response that is not qbXML\n";
+
 int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, std::ostream& err) {
   CLI::App app{"Exchanges qbXML with a QuickBooks company file through DroQbXml.", "droqbxml"};
   app.require_subcommand(1);
+  // Global options may come before or after the command.
+  app.fallthrough();
+  app.footer(kExitCodes);
+  app.failure_message([](const CLI::App* /*app*/, const CLI::Error& error) {
+    return std::string("droqbxml: ") + error.what() + " (see droqbxml --help)\n";
+  });
+  app.set_version_flag("--version",
+                       std::string("droqbxml ") + DROQBXML_VERSION + " (qbXML 13.0 requests)");
   ConnectionOptions connection;
   app.add_option("--app-name", connection.appName, "Application name shown to QuickBooks");
   app.add_option("--app-id", connection.appId, "Application identifier");
   app.add_option("--processor", connection.processor,
                  "ProgID of the registered request processor to use");
+  app.add_option("--company", connection.company,
+                 "Company file to open; \"C:\\...\" paths map as the component maps them "
+                 "(demo: created when missing and kept; default a temporary one)");
+  app.add_option("--trace", connection.traceFile,
+                 "Append the component's trace of each exchange to this file");
+
+  int format = 0;
+  const auto addFormat = [&](CLI::App& command) {
+    named(command.add_option("--format", format, "Output: the response document, or JSON"),
+          kFormats);
+  };
 
   std::string file;
-  auto* send = app.add_subcommand("send", "Send a request document and print the response");
+  auto* send = app.add_subcommand(
+      "send",
+      "Send a request document; the response on standard output, a status line per "
+      "response on standard error");
   send->add_option("FILE", file, "Request document, or - for standard input")->required();
-  addConnectionOptions(*send, connection);
+  addFormat(*send);
 
   QueryOptions query;
   auto* querySub =
       app.add_subcommand("query", "Build a query request, send it, print the response");
   addQueryOptions(*querySub, query);
-  addConnectionOptions(*querySub, connection);
+  addFormat(*querySub);
 
   QueryOptions built;
   auto* build = app.add_subcommand("build", "Print a request document instead of sending it");
@@ -134,22 +203,25 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
   unescape->add_option("TEXT", text)->required();
 
   CompanyOptions company;
+  int salesTax = 1;
+  int autoLogin = 1;
   auto* companyCommand =
       app.add_subcommand("company", "Create and manage company files of the embedded stand-in");
   companyCommand->require_subcommand(1);
   auto* create = companyCommand->add_subcommand("create", "Create a new company file");
   create->add_option("PATH", company.path, "Company file to create")->required();
   create->add_option("--name", company.name, "Company name");
-  create->add_option("--sales-tax", company.salesTax, "Sales tax on or off")
-      ->transform(CLI::CheckedTransformer(kOnOff, CLI::ignore_case));
+  named(create->add_option("--sales-tax", salesTax, "Sales tax on or off"), kOnOff);
+  create->add_option("--allow", company.allow,
+                     "An application the file lets in (repeatable; default: the component's own "
+                     "application name)");
   auto* show = companyCommand->add_subcommand("show", "Summarise a company file");
   show->add_option("PATH", company.path, "Company file")->required();
   auto* allow =
       companyCommand->add_subcommand("allow", "Allow an application to use the company file");
   allow->add_option("PATH", company.path, "Company file")->required();
   allow->add_option("APPNAME", company.appName, "Application name")->required();
-  allow->add_option("--auto-login", company.autoLogin, "May log in without a user present")
-      ->transform(CLI::CheckedTransformer(kOnOff, CLI::ignore_case));
+  named(allow->add_option("--auto-login", autoLogin, "May log in without a user present"), kOnOff);
   auto* deny = companyCommand->add_subcommand("deny", "Refuse an application the company file");
   deny->add_option("PATH", company.path, "Company file")->required();
   deny->add_option("APPNAME", company.appName, "Application name")->required();
@@ -158,14 +230,13 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
       "lint", "Check a request document against qbXML 13.0 and name each problem");
   lint->add_option("FILE", file, "Request document, or - for standard input")->required();
 
+  auto* paths = app.add_subcommand(
+      "paths", "Print the component's installation folder and the logs it writes there");
+
   auto* demo = app.add_subcommand(
       "demo",
       "Add customers, items, an estimate and an invoice to a company file of the embedded "
       "stand-in: a line a step (what was sent, the status, the record read back) and a summary");
-  addConnectionOptions(*demo, connection);
-  demo->get_option("--company")
-      ->description(
-          "Company file to use, created when missing and kept (default: a temporary one)");
   bool verbose = false;
   demo->add_flag("--verbose,-v", verbose,
                  "Also print every request, response and record dump, and what lint finds in "
@@ -187,26 +258,35 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
     const int code = app.exit(error, out, err);
     return code == 0 ? kExitSuccess : kExitUsage;
   }
+  company.salesTax = salesTax != 0;
+  company.autoLogin = autoLogin != 0;
+  const auto output = format == 1 ? OutputFormat::Json : OutputFormat::Xml;
 
   const Io io{in, out, err};
   selectDefaultProcessor();
   try {
-    if (send->parsed()) return sendCommand(io, file, connection);
-    if (querySub->parsed()) return queryCommand(io, query, connection);
+    if (send->parsed()) return sendCommand(io, file, connection, output);
+    if (querySub->parsed()) return queryCommand(io, query, connection, output);
     if (buildQuery->parsed()) return buildQueryCommand(io, built);
     if (escape->parsed()) return escapeCommand(io, text);
     if (unescape->parsed()) return unescapeCommand(io, text);
-    if (create->parsed()) return companyCreateCommand(io, company);
+    if (create->parsed()) {
+      if (company.allow.empty()) company.allow.push_back(componentAppName());
+      return companyCreateCommand(io, company);
+    }
     if (show->parsed()) return companyShowCommand(io, company);
     if (allow->parsed()) return companyAllowCommand(io, company);
     if (deny->parsed()) return companyDenyCommand(io, company);
     if (lint->parsed()) return lintCommand(io, file);
+    if (paths->parsed()) return pathsCommand(io);
     if (demo->parsed()) return demoCommand(io, connection, verbose);
     if (relay->parsed()) return relayCommand(io, port, connection);
   } catch (const ComError& error) {
     err << "droqbxml: " << error.what() << " (error " << error.number() << ", "
         << toUtf8(error.source()) << ")\n";
-    return kExitNotSuccess;
+    // Text the component cannot escape or unescape is bad input; anything else is a failure
+    // of the exchange.
+    return escape->parsed() || unescape->parsed() ? kExitUsage : kExitConnection;
   }
   return kExitUsage;
 }

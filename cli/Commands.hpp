@@ -9,9 +9,12 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "droqbxml/component/DroXmlProcessor.hpp"
 #include "droqbxml/connection/RequestProcessor.hpp"
+#include "droqbxml/diagnostics/clsTrace.hpp"
+#include "droqbxml/runtime/ComError.hpp"
 
 namespace droqbxml::cli {
 
@@ -26,7 +29,10 @@ struct ConnectionOptions {
   std::optional<std::string> appName;
   std::optional<std::string> appId;
   std::optional<std::string> processor;
+  std::optional<std::string> traceFile;  // the component's trace output, when asked for
 };
+
+enum class OutputFormat { Xml, Json };
 
 struct QueryOptions {
   int32_t kind = 0;  // udEntityType
@@ -40,6 +46,24 @@ struct QueryOptions {
 
 // "RSSuccess (0)", or "status N" for a code without a name.
 std::string statusText(int32_t status);
+
+// What passed between the command and the request processor, recorded beside the
+// component: the last response exactly as the processor returned it, and the last failure
+// the processor raised, with the call that raised it.
+struct Journal {
+  std::optional<std::string> response;
+  std::optional<ErrorRecord> failure;
+  std::string failedCall;
+};
+
+// The installation folder of the component as this command uses it (created when missing),
+// and the logs the component writes under it.
+struct InstallationPaths {
+  Text folder;
+  Text errorLog;
+  Text exchangeLog;
+};
+InstallationPaths installationPaths();
 
 // A connection and a session on a company file through the facade, as a host opens them.
 // open() reports a failure on the error stream and returns false; the destructor ends the
@@ -56,32 +80,49 @@ class Session {
   Text send(const Text& request);
   int32_t status() const;
   DroXmlProcessor& facade() { return *facade_; }
+  const Journal& journal() const { return *journal_; }
 
  private:
+  void trace(const Text& line);
+  void reportRefusal(const std::string& what);
+
   Io io_;
   const ConnectionOptions& options_;
+  std::shared_ptr<Journal> journal_ = std::make_shared<Journal>();
+  std::unique_ptr<clsTrace> tracer_;
   std::unique_ptr<DroXmlProcessor> facade_;
   bool connected_ = false;
   bool inSession_ = false;
 };
 
-// Makes the processor registered as `name` answer for QuickBooks' ProgID while it lives.
+// Changes what answers for QuickBooks' ProgID while it lives: the processor registered as
+// `name` (nothing changes without a name), or every processor made passed through `wrap`.
 class ProcessorOverride {
  public:
+  using Wrap = std::function<std::shared_ptr<RequestProcessor>(std::shared_ptr<RequestProcessor>)>;
   explicit ProcessorOverride(const std::optional<std::string>& name);
+  explicit ProcessorOverride(Wrap wrap);
   ~ProcessorOverride();
   ProcessorOverride(const ProcessorOverride&) = delete;
   ProcessorOverride& operator=(const ProcessorOverride&) = delete;
 
  private:
+  void install(RequestProcessorFactory factory);
+
   bool active_ = false;
-  std::function<std::shared_ptr<RequestProcessor>()> previous_;
+  RequestProcessorFactory previous_;
 };
 
 Text buildQuery(const QueryOptions& query);
+// What QuickBooks is known to refuse in a request the builder wrote (lint's first finding),
+// or nothing.
+std::optional<std::string> knownRefusal(const Text& request);
 
-int sendCommand(Io io, const std::string& file, const ConnectionOptions& connection);
-int queryCommand(Io io, const QueryOptions& query, const ConnectionOptions& connection);
+int sendCommand(Io io, const std::string& file, const ConnectionOptions& connection,
+                OutputFormat format);
+int queryCommand(Io io, const QueryOptions& query, const ConnectionOptions& connection,
+                 OutputFormat format);
+int pathsCommand(Io io);
 int buildQueryCommand(Io io, const QueryOptions& query);
 int escapeCommand(Io io, const std::string& text);
 int unescapeCommand(Io io, const std::string& text);
@@ -92,7 +133,11 @@ struct CompanyOptions {
   bool salesTax = true;
   std::string appName;
   bool autoLogin = true;
+  std::vector<std::string> allow;  // company create: the applications let in
 };
+
+// The application name the component gives QuickBooks unless the host names another.
+std::string componentAppName();
 
 int companyCreateCommand(Io io, const CompanyOptions& options);
 int companyShowCommand(Io io, const CompanyOptions& options);

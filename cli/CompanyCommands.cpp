@@ -1,9 +1,12 @@
 // company create/show/allow/deny and lint: the commands that work on the stand-in's company
 // files and on request documents without talking to a processor.
+#include <filesystem>
 #include <iostream>
 
 #include "cli/Cli.hpp"
 #include "cli/Commands.hpp"
+#include "droqbxml/runtime/FileSystem.hpp"
+#include "droqbxml/runtime/Utf.hpp"
 #include "simulator/CompanyFile.hpp"
 #include "simulator/RequestDocument.hpp"
 
@@ -13,10 +16,14 @@ namespace {
 using simulator::CompanyFile;
 using simulator::CompanyFileError;
 
+// A company file's path as the command was given it, mapped as the component maps paths
+// ("C:\\Books\\x.qbw").
+std::filesystem::path fileOf(const std::string& path) { return mapPath(fromUtf8(path)); }
+
 template <class F>
 int withCompanyFile(Io io, const std::string& path, F work) {
   try {
-    CompanyFile company(path);
+    CompanyFile company(fileOf(path));
     return work(company);
   } catch (const CompanyFileError& error) {
     io.err << "droqbxml: " << error.what() << '\n';
@@ -28,13 +35,15 @@ int withCompanyFile(Io io, const std::string& path, F work) {
 
 int companyCreateCommand(Io io, const CompanyOptions& options) {
   try {
-    CompanyFile::create(options.path, {options.name, options.salesTax});
+    CompanyFile::create(fileOf(options.path), {options.name, options.salesTax, options.allow});
   } catch (const CompanyFileError& error) {
     io.err << "droqbxml: " << error.what() << '\n';
     return error.kind() == CompanyFileError::Kind::AlreadyExists ? kExitUsage : kExitConnection;
   }
   io.out << "Created company file " << options.path << " (\"" << options.name << "\", sales tax "
-         << (options.salesTax ? "on" : "off") << ")\n";
+         << (options.salesTax ? "on" : "off") << "; lets in";
+  for (const auto& name : options.allow) io.out << " \"" << name << '"';
+  io.out << ")\n";
   return kExitSuccess;
 }
 

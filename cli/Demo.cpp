@@ -556,14 +556,16 @@ int demoCommand(Io io, const ConnectionOptions& options, bool verbose) {
   if (temporaryCompany) connection.company = (temporary.path() / "demo-company.qbw").string();
   ConnectionOptions noTax = connection;
   noTax.company = (temporary.path() / "no-sales-tax.qbw").string();
+  const std::vector<std::string> allowed{connection.appName ? *connection.appName
+                                                            : componentAppName()};
   try {
     if (!std::filesystem::exists(connection.company)) {
-      simulator::CompanyFile::create(connection.company, {"Demo Company", true});
+      simulator::CompanyFile::create(connection.company, {"Demo Company", true, allowed});
       io.out << "Created company file " << connection.company << "\n";
     } else {
       io.out << "Using company file " << connection.company << "\n";
     }
-    simulator::CompanyFile::create(noTax.company, {"No Sales Tax Company", false});
+    simulator::CompanyFile::create(noTax.company, {"No Sales Tax Company", false, allowed});
   } catch (const simulator::CompanyFileError& error) {
     io.err << "droqbxml: " << error.what() << '\n';
     return kExitConnection;

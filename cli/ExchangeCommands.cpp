@@ -1,15 +1,24 @@
 // send, query, build query, escape and unescape: the commands that talk qbXML through the
 // facade, the builder and the wrapper as a host does.
+#include <cstdio>
+#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <iterator>
+#include <type_traits>
 
 #include "cli/Cli.hpp"
 #include "cli/Commands.hpp"
+#include "cli/ResponseDocument.hpp"
+#include "droqbxml/connection/DroXmlSdkWrapper.hpp"
 #include "droqbxml/connection/RequestProcessor.hpp"
+#include "droqbxml/diagnostics/Logs.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 #include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/FileSystem.hpp"
 #include "droqbxml/runtime/Utf.hpp"
+#include "simulator/CompanyFile.hpp"
+#include "simulator/RequestDocument.hpp"
 
 namespace droqbxml::cli {
 namespace {
@@ -33,20 +42,149 @@ constexpr StatusName kStatusNames[] = {
     {"RSUnsetCoFile", RSUnsetCoFile},
 };
 
-void printResponse(Io io, const Text& response, int32_t status) {
-  const std::string text = toUtf8(response);
-  io.out << text;
-  if (!text.empty() && text.back() != '\n') io.out << '\n';
-  io.out << "Response status: " << statusText(status) << '\n';
+std::string hresultText(int32_t number) {
+  char text[16];
+  std::snprintf(text, sizeof text, "0x%08X", static_cast<uint32_t>(number));
+  return text;
 }
 
-int exchangeOne(Io io, const Text& request, const ConnectionOptions& connection) {
+// Passes every call to the processor it wraps and notes the raw response and any failure.
+class RecordingProcessor final : public RequestProcessor {
+ public:
+  RecordingProcessor(std::shared_ptr<RequestProcessor> inner, std::shared_ptr<Journal> journal)
+      : inner_(std::move(inner)), journal_(std::move(journal)) {}
+
+  void OpenConnection(const Text& appID, const Text& appName) override {
+    record("OpenConnection", [&] { inner_->OpenConnection(appID, appName); });
+  }
+  Text BeginSession(const Text& qbFile, QBFileMode mode) override {
+    return record("BeginSession", [&] { return inner_->BeginSession(qbFile, mode); });
+  }
+  Text ProcessRequest(const Text& ticket, const Text& request) override {
+    journal_->response.reset();
+    Text response =
+        record("ProcessRequest", [&] { return inner_->ProcessRequest(ticket, request); });
+    journal_->response = toUtf8(response);
+    return response;
+  }
+  void EndSession(const Text& ticket) override {
+    record("EndSession", [&] { inner_->EndSession(ticket); });
+  }
+  void CloseConnection() override {
+    record("CloseConnection", [&] { inner_->CloseConnection(); });
+  }
+  Text GetCurrentCompanyFileName(const Text& ticket) override {
+    return inner_->GetCurrentCompanyFileName(ticket);
+  }
+  int16_t MajorVersion() override { return inner_->MajorVersion(); }
+  int16_t MinorVersion() override { return inner_->MinorVersion(); }
+
+ private:
+  template <class Call>
+  std::invoke_result_t<Call> record(const char* name, Call call) {
+    try {
+      return call();
+    } catch (const ComError& error) {
+      journal_->failure = error.record();
+      journal_->failedCall = name;
+      throw;
+    }
+  }
+
+  std::shared_ptr<RequestProcessor> inner_;
+  std::shared_ptr<Journal> journal_;
+};
+
+// Why QuickBooks refused a session on `company`, in words, from its HRESULT and, where one
+// code covers several causes, from the file itself.
+std::string refusalReason(int32_t number, const std::string& company) {
+  switch (static_cast<uint32_t>(number)) {
+    case 0x8004041Au:
+      return "the company file denies this application";
+    case 0x8004041Du:
+      return "the application may not log in automatically and nobody is logged in";
+    case 0x80040418u:
+      return "the company file has not seen this application before and nobody is there to "
+             "approve it";
+    case 0x8004040Au:
+      return "another company file is open";
+    default:
+      break;
+  }
+  try {
+    simulator::CompanyFile probe(mapPath(fromUtf8(company)));
+  } catch (const simulator::CompanyFileError& error) {
+    using Kind = simulator::CompanyFileError::Kind;
+    switch (error.kind()) {
+      case Kind::Missing:
+        return "the company file does not exist";
+      case Kind::NotACompanyFile:
+        return "the file is not a company file";
+      case Kind::Damaged:
+        return "the company file is damaged";
+      case Kind::Busy:
+        return "the company file is locked by another process";
+      case Kind::ReadOnly:
+        return "the company file cannot be written";
+      case Kind::Unreadable:
+      case Kind::AlreadyExists:
+        return "the company file cannot be read";
+    }
+  } catch (const std::exception&) {
+    return "the company file cannot be opened";
+  }
+  return "QuickBooks refused the session";
+}
+
+int reportResponse(Io io, const Session& session, OutputFormat format) {
+  const Journal& journal = session.journal();
+  if (journal.failure) {
+    io.err << "droqbxml: QuickBooks did not process the request: "
+           << toUtf8(journal.failure->Description) << " (" << hresultText(journal.failure->Number)
+           << ")"
+           << (journal.failure->Number == static_cast<int32_t>(0x80040400u)
+                   ? "; droqbxml lint names what is wrong"
+                   : "")
+           << '\n';
+    return kExitConnection;
+  }
+  if (!journal.response) {
+    io.err << "droqbxml: no response was recorded (status " << statusText(session.status())
+           << ")\n";
+    return kExitConnection;
+  }
+  std::string error;
+  const auto document = parseResponse(*journal.response, error);
+  if (!document) {
+    io.out << *journal.response;
+    io.err << "droqbxml: the response is not a qbXML response document: " << error << '\n';
+    return kExitConnection;
+  }
+  if (format == OutputFormat::Json) {
+    io.out << responsesAsJson(*document);
+  } else {
+    io.out << *journal.response;
+  }
+  int exit = kExitSuccess;
+  for (const XmlElement* response : document->responses()) {
+    io.err << statusLine(*response) << '\n';
+    if (severityOf(*response) != Severity::Info) exit = kExitNotSuccess;
+  }
+  return exit;
+}
+
+int exchangeOne(Io io, const Text& request, const ConnectionOptions& connection,
+                OutputFormat format) {
   const ProcessorOverride override(connection.processor);
   Session session(io, connection);
   if (!session.open()) return kExitConnection;
-  const Text response = session.send(request);
-  printResponse(io, response, session.status());
-  return session.status() == RSSuccess ? kExitSuccess : kExitNotSuccess;
+  session.send(request);
+  return reportResponse(io, session, format);
+}
+
+void createFolders(const Text& path) {
+  std::error_code ignored;
+  std::filesystem::create_directories(mapPath(path), ignored);
 }
 
 }  // namespace
@@ -64,10 +202,20 @@ ProcessorOverride::ProcessorOverride(const std::optional<std::string>& name) {
   if (!name) return;
   const Text progId = fromUtf8(*name);
   if (equalsIgnoreCase(progId, kRequestProcessorProgId)) return;
+  install([progId] { return createRequestProcessor(progId); });
+}
+
+ProcessorOverride::ProcessorOverride(Wrap wrap) {
+  // Without a registered processor the platform's own is made, which cannot be wrapped.
+  auto inner = registeredRequestProcessor(kRequestProcessorProgId);
+  if (!inner) return;
+  install([inner, wrap = std::move(wrap)] { return wrap(inner()); });
+}
+
+void ProcessorOverride::install(RequestProcessorFactory factory) {
   active_ = true;
   previous_ = registeredRequestProcessor(kRequestProcessorProgId);
-  registerRequestProcessor(kRequestProcessorProgId,
-                           [progId] { return createRequestProcessor(progId); });
+  registerRequestProcessor(kRequestProcessorProgId, std::move(factory));
 }
 
 ProcessorOverride::~ProcessorOverride() {
@@ -79,6 +227,19 @@ ProcessorOverride::~ProcessorOverride() {
   }
 }
 
+InstallationPaths installationPaths() {
+  const Text folder(kDefaultInstallPath);
+  createFolders(folder);
+  return {folder, folder + u"\\Logs\\ErrorLog.txt",
+          folder + u"\\Logs\\qbXmlErrors\\qbXML-Error.txt"};
+}
+
+std::string componentAppName() {
+  // The wrapper names the component to QuickBooks only when a processor exists to talk to.
+  const DroXmlSdkWrapper wrapper;
+  return wrapper.appName().empty() ? "Tessaly" : toUtf8(wrapper.appName());
+}
+
 Session::Session(Io io, const ConnectionOptions& options) : io_(io), options_(options) {}
 
 Session::~Session() {
@@ -87,8 +248,25 @@ Session::~Session() {
   try {
     if (inSession_) api->SessionEnd();
     if (connected_) api->ConnectionClose();
+    trace(u"Session ended, connection closed");
   } catch (const ComError& error) {
     io_.err << "droqbxml: cannot end the session: " << error.what() << '\n';
+  }
+}
+
+void Session::trace(const Text& line) {
+  if (!tracer_) return;
+  tracer_->Trace(line, eOutToFile, fromUtf8(*options_.traceFile), eAppend, true);
+}
+
+void Session::reportRefusal(const std::string& what) {
+  io_.err << "droqbxml: cannot " << what << " on \"" << options_.company << "\": ";
+  const auto& failure = journal_->failure;
+  if (failure) {
+    io_.err << refusalReason(failure->Number, options_.company) << ". QuickBooks: \""
+            << toUtf8(failure->Description) << "\" (" << hresultText(failure->Number) << ")\n";
+  } else {
+    io_.err << statusText(facade_->API()->ResponseStatus()) << '\n';
   }
 }
 
@@ -101,37 +279,57 @@ bool Session::open() {
             << " (" << error.what() << ")\n";
     return false;
   }
-  facade_ = std::make_unique<DroXmlProcessor>();
+  if (options_.traceFile) tracer_ = std::make_unique<clsTrace>();
+  {
+    const ProcessorOverride recording(
+        [journal = journal_](std::shared_ptr<RequestProcessor> inner) {
+          return std::make_shared<RecordingProcessor>(std::move(inner), journal);
+        });
+    facade_ = std::make_unique<DroXmlProcessor>();
+  }
   const auto api = facade_->API();
+  facade_->DroPath(installationPaths().folder);
   if (options_.appName) api->appName(fromUtf8(*options_.appName));
   if (options_.appId) api->appID(fromUtf8(*options_.appId));
   api->CompanyFilePath(fromUtf8(options_.company));
+  trace(u"Opening a connection as \"" + api->appName() + u"\" (" + api->appID() + u")");
   try {
     api->ConnectionOpen();
     connected_ = true;
   } catch (const ComError& error) {
-    io_.err << "droqbxml: cannot open a connection to QuickBooks: " << error.what() << '\n';
+    io_.err << "droqbxml: cannot open a connection to QuickBooks: " << error.what() << " ("
+            << hresultText(error.number()) << ")\n";
     return false;
   }
+  trace(u"Beginning a session on \"" + api->CompanyFilePath() + u"\"");
   try {
     api->SessionBegin();
   } catch (const ComError& error) {
     connected_ = false;  // the wrapper closed it
-    io_.err << "droqbxml: cannot begin a session on \"" << options_.company
-            << "\": " << error.what() << '\n';
+    reportRefusal("begin a session");
     return false;
   }
   const int32_t refused = api->ResponseStatus();
-  if (refused == RSUnsetCoFile || refused == RSCoNameMismatch || refused == RSCantLogin) {
+  if (refused == RSUnsetCoFile) {
     io_.err << "droqbxml: cannot begin a session: " << statusText(refused)
-            << (refused == RSUnsetCoFile ? "; name the company file with --company" : "") << '\n';
+            << "; name the company file with --company\n";
+    return false;
+  }
+  if (refused == RSCoNameMismatch || refused == RSCantLogin) {
+    reportRefusal("begin a session");
     return false;
   }
   inSession_ = true;
   return true;
 }
 
-Text Session::send(const Text& request) { return facade_->API()->ProcessRequest(request); }
+Text Session::send(const Text& request) {
+  trace(u"Request:\r\n" + request);
+  Text response = facade_->API()->ProcessRequest(request);
+  trace(u"Response (" + fromUtf8(statusText(status())) + u"):\r\n" +
+        (journal_->response ? fromUtf8(*journal_->response) : response));
+  return response;
+}
 
 int32_t Session::status() const { return facade_->API()->ResponseStatus(); }
 
@@ -168,20 +366,52 @@ std::optional<std::string> readDocument(Io io, const std::string& file) {
   return bytes;
 }
 
-int sendCommand(Io io, const std::string& file, const ConnectionOptions& connection) {
+std::optional<std::string> knownRefusal(const Text& request) {
+  const auto read = simulator::readRequest(toUtf8(request));
+  if (read.problems.empty()) return std::nullopt;
+  const auto& first = read.problems.front();
+  return first.element + ": " + first.message;
+}
+
+int sendCommand(Io io, const std::string& file, const ConnectionOptions& connection,
+                OutputFormat format) {
   const auto bytes = readDocument(io, file);
   if (!bytes) return kExitUsage;
   const Text request = fromUtf8(*bytes);
-  if (trimView(request).empty()) io.err << "droqbxml: the request document is empty\n";
-  return exchangeOne(io, request, connection);
+  if (bytes->find_first_not_of(" \t\r\n") == std::string::npos) {
+    io.err << "droqbxml: the request document "
+           << (file == "-" ? "on standard input" : "\"" + file + "\"") << " is empty\n";
+    return kExitUsage;
+  }
+  return exchangeOne(io, request, connection, format);
 }
 
-int queryCommand(Io io, const QueryOptions& query, const ConnectionOptions& connection) {
-  return exchangeOne(io, buildQuery(query), connection);
+int queryCommand(Io io, const QueryOptions& query, const ConnectionOptions& connection,
+                 OutputFormat format) {
+  const Text request = buildQuery(query);
+  if (const auto refusal = knownRefusal(request)) {
+    io.err << "droqbxml: QuickBooks refuses this request: " << *refusal << '\n';
+  }
+  return exchangeOne(io, request, connection, format);
 }
 
 int buildQueryCommand(Io io, const QueryOptions& query) {
-  io.out << toUtf8(buildQuery(query)) << '\n';
+  const Text request = buildQuery(query);
+  if (const auto refusal = knownRefusal(request)) {
+    io.err << "droqbxml: QuickBooks refuses this request: " << *refusal << '\n';
+  }
+  io.out << toUtf8(request) << '\n';
+  return kExitSuccess;
+}
+
+int pathsCommand(Io io) {
+  const InstallationPaths paths = installationPaths();
+  const auto line = [&](const char* label, const Text& path) {
+    io.out << label << toUtf8(path) << "  (" << mapPath(path).string() << ")\n";
+  };
+  line("Installation folder: ", paths.folder);
+  line("Error log: ", paths.errorLog);
+  line("Failed-exchange log: ", paths.exchangeLog);
   return kExitSuccess;
 }
 

@@ -145,6 +145,13 @@ void writeOwnTables(sqlite3* db, const CompanySettings& settings) {
         .bind(2, value)
         .step();
   }
+  for (const auto& name : settings.allowedApplications) {
+    Statement(db,
+              "INSERT OR REPLACE INTO integrated_applications (name, allowed, auto_login) "
+              "VALUES (?, 1, 1)")
+        .bind(1, name)
+        .step();
+  }
 }
 
 // Settings every connection of the stand-in runs with.

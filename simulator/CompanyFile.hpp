@@ -12,6 +12,7 @@
 #include <stdexcept>
 #include <string>
 #include <string_view>
+#include <vector>
 
 struct sqlite3;
 
@@ -20,6 +21,9 @@ namespace droqbxml::simulator {
 struct CompanySettings {
   std::string companyName = "My Company";
   bool salesTax = true;
+  // Applications the new file lets in, logging in automatically. Any other application is
+  // refused until the file allows it: nobody is at the keyboard to approve it.
+  std::vector<std::string> allowedApplications;
 };
 
 struct ApplicationAccess {

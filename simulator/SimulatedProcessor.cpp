@@ -31,6 +31,7 @@ enum class Failure : size_t {
   InvalidTicket,
   AccessDenied,
   NoAutoLogin,
+  NotYetAccessed,
   OpenConnectionNotCalled,
   BeginSessionNotCalled,
 };
@@ -43,7 +44,7 @@ struct FailureText {
 
 // QuickBooks' texts, word for word: the component recognises some of them by their text.
 // The two "has not been called" messages have no public code of their own.
-constexpr std::array<FailureText, 9> kFailures{{
+constexpr std::array<FailureText, 10> kFailures{{
     {Failure::Parse, ProcessorHresult::kParseError,
      u"QuickBooks found an error when parsing the provided XML text stream."},
     {Failure::Unexpected, ProcessorHresult::kUnexpected,
@@ -62,6 +63,10 @@ constexpr std::array<FailureText, 9> kFailures{{
      u"This application is not allowed to log into this QuickBooks company data file "
      u"automatically. The QuickBooks administrator can grant permission for automatic login "
      u"through the Integrated Application preferences."},
+    {Failure::NotYetAccessed, ProcessorHresult::kNotYetAccessed,
+     u"This application has not accessed this QuickBooks company data file before.  Only the "
+     u"QuickBooks administrator can grant permission for an application to access a "
+     u"QuickBooks company data file for the first time."},
     {Failure::OpenConnectionNotCalled, ProcessorHresult::kUnexpected,
      u"The method \"OpenConnection\" has not been called."},
     {Failure::BeginSessionNotCalled, ProcessorHresult::kUnexpected,
@@ -181,10 +186,9 @@ class ClaimGuard {
 void admit(CompanyFile& company, const Text& appName) {
   const std::string name = toUtf8(appName);
   const auto access = onCompanyFile([&] { return company.application(name); });
-  if (!access) {
-    onCompanyFile([&] { company.setApplication(name, ApplicationAccess{}); });
-    return;
-  }
+  // QuickBooks asks the administrator at the keyboard about a new application; with
+  // nobody there to answer, the application is refused until the file allows it.
+  if (!access) raise(Failure::NotYetAccessed);
   if (!access->allowed) raise(Failure::AccessDenied);
   if (!access->autoLogin) raise(Failure::NoAutoLogin);
 }

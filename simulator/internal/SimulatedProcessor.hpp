@@ -26,6 +26,7 @@ inline constexpr int32_t kUnexpected = static_cast<int32_t>(0x80040402u);
 inline constexpr int32_t kCouldNotOpenFile = static_cast<int32_t>(0x80040403u);
 inline constexpr int32_t kOtherFileOpen = static_cast<int32_t>(0x8004040Au);
 inline constexpr int32_t kInvalidTicket = static_cast<int32_t>(0x8004040Du);
+inline constexpr int32_t kNotYetAccessed = static_cast<int32_t>(0x80040418u);
 inline constexpr int32_t kAccessDenied = static_cast<int32_t>(0x8004041Au);
 inline constexpr int32_t kNoAutoLogin = static_cast<int32_t>(0x8004041Du);
 }  // namespace ProcessorHresult

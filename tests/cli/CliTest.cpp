@@ -48,7 +48,7 @@ TEST_F(CliTest, EscapesAndUnescapes) {
   EXPECT_EQ(run({"escape", "caf\xC3\xA9"}).out, "caf&#233;\n");
   EXPECT_EQ(run({"unescape", "&amp;lt; &#65;"}).out, "&lt; A\n");
   const Result bad = run({"unescape", "&#;"});
-  EXPECT_EQ(bad.code, cli::kExitNotSuccess);
+  EXPECT_EQ(bad.code, cli::kExitUsage);
   EXPECT_NE(bad.err.find("Type mismatch"), std::string::npos);
 }
 
@@ -94,37 +94,68 @@ TEST_F(CliTest, RefusesBadArgumentsWithUsageCode) {
   EXPECT_NE(help.out.find("--item-kind"), std::string::npos);
 }
 
-TEST_F(CliTest, SendsARequestAndReportsTheStatus) {
-  const Result ok = send({}, "\xEF\xBB\xBF<request/>");
-  EXPECT_EQ(ok.code, cli::kExitSuccess) << ok.err;
-  EXPECT_EQ(ok.out,
-            "<QBXML><QBXMLMsgsRs><X statusCode=\"0\" /></QBXMLMsgsRs></QBXML>\n"
-            "Response status: RSSuccess (0)\n");
+TEST_F(CliTest, PrintsTheResponseAsReturnedAndSummarisesEachStatus) {
+  fake_->process = [](const Text&) {
+    return Text(
+        u"<QBXML><QBXMLMsgsRs><InvoiceQueryRs requestID=\"7\" statusCode=\"0\" "
+        u"statusSeverity=\"Info\" statusMessage=\"Status OK\" retCount=\"1\"><InvoiceRet>"
+        u"<TxnID>1-2</TxnID><CustomerRef><FullName>A &amp; B</FullName></CustomerRef>"
+        u"<InvoiceLineRet><Desc>a</Desc></InvoiceLineRet><InvoiceLineRet><Desc>b</Desc>"
+        u"</InvoiceLineRet></InvoiceRet></InvoiceQueryRs><X statusCode=\"1\" "
+        u"statusSeverity=\"Info\" statusMessage=\"none\"/></QBXMLMsgsRs></QBXML>");
+  };
+  const Result xml = send({}, "\xEF\xBB\xBF<request/>");
+  EXPECT_EQ(xml.code, cli::kExitSuccess) << xml.err;
+  EXPECT_EQ(xml.out, toUtf8(fake_->process(u"")));
+  EXPECT_EQ(xml.err,
+            "InvoiceQueryRs requestID=7 statusCode=0 statusSeverity=Info statusMessage=Status OK\n"
+            "X statusCode=1 statusSeverity=Info statusMessage=none\n");
   EXPECT_EQ(fake_->calls,
             (std::vector<std::string>{"OpenConnection(4093-27-,Tessaly)",
                                       "BeginSession(C:\\co.qbw,2)", "ProcessRequest(ticket-1)",
                                       "EndSession(ticket-1)", "CloseConnection"}));
+  // Repeated elements become arrays; values stay text.
+  EXPECT_EQ(send({"--format", "JSON"}).out,
+            "[\n  {\n    \"response\": \"InvoiceQueryRs\",\n    \"requestID\": \"7\",\n"
+            "    \"statusCode\": \"0\",\n    \"statusSeverity\": \"Info\",\n"
+            "    \"statusMessage\": \"Status OK\",\n    \"retCount\": \"1\",\n"
+            "    \"records\": [\n      {\n        \"InvoiceRet\": {\n"
+            "          \"TxnID\": \"1-2\",\n          \"CustomerRef\": {\n"
+            "            \"FullName\": \"A & B\"\n          },\n"
+            "          \"InvoiceLineRet\": [\n            {\n              \"Desc\": \"a\"\n"
+            "            },\n            {\n              \"Desc\": \"b\"\n            }\n"
+            "          ]\n        }\n      }\n    ]\n  },\n  {\n    \"response\": \"X\",\n"
+            "    \"statusCode\": \"1\",\n    \"statusSeverity\": \"Info\",\n"
+            "    \"statusMessage\": \"none\",\n    \"records\": []\n  }\n]\n");
 
-  fake_->process = [](const Text&) { return Text(u"<Rs statusCode=\"1\"/>\n"); };
-  const Result none = send({});
-  EXPECT_EQ(none.code, cli::kExitNotSuccess);
-  EXPECT_EQ(none.out, "<Rs statusCode=\"1\"/>\nResponse status: RSNoMatch (1)\n");
+  // Any response that is not Info makes the exit code 1, wherever it stands.
+  fake_->process = [](const Text&) {
+    return Text(
+        u"<QBXML><QBXMLMsgsRs><A statusCode=\"0\" statusSeverity=\"Info\" statusMessage=\"\"/>"
+        u"<B statusCode=\"3100\" statusSeverity=\"Error\" statusMessage=\"x\"/>"
+        u"<C statusCode=\"0\" statusSeverity=\"Info\" statusMessage=\"\"/></QBXMLMsgsRs></QBXML>");
+  };
+  EXPECT_EQ(send({}).code, cli::kExitNotSuccess);
 
-  const Result empty = send({}, "  ");
-  EXPECT_EQ(empty.code, cli::kExitNotSuccess);
-  EXPECT_NE(empty.err.find("the request document is empty"), std::string::npos);
-  EXPECT_EQ(empty.out, "Response status: RSUnknown (-10)\n");
+  // A response that is not qbXML is passed through and is a failure of the exchange.
+  fake_->process = [](const Text&) { return Text(u"<Rs statusCode=\"0\"/>"); };
+  const Result odd = send({});
+  EXPECT_EQ(odd.code, cli::kExitConnection);
+  EXPECT_EQ(odd.out, "<Rs statusCode=\"0\"/>");
+  EXPECT_EQ(odd.err,
+            "droqbxml: the response is not a qbXML response document: no QBXML/QBXMLMsgsRs "
+            "element\n");
 }
 
 TEST_F(CliTest, QueriesThroughTheBuilderWithTheHostsIdentity) {
   Text sent;
   fake_->process = [&](const Text& request) {
     sent = request;
-    return Text(u"<Rs statusCode=\"0\"/>");
+    return Text(u"<QBXML><QBXMLMsgsRs/></QBXML>");
   };
   const Result result =
-      run({"--processor", "Test.FakeProcessor", "--app-name", "Job Costing", "--app-id", "1111-22-",
-           "query", "customer", "--full-name", "A&B", "--company", "C:\\co.qbw"});
+      run({"query", "customer", "--full-name", "A&B", "--company", "C:\\co.qbw", "--processor",
+           "Test.FakeProcessor", "--app-name", "Job Costing", "--app-id", "1111-22-"});
   EXPECT_EQ(result.code, cli::kExitSuccess) << result.err;
   EXPECT_EQ(fake_->calls.front(), "OpenConnection(1111-22-,Job Costing)");
   EXPECT_NE(sent.find(u"<FullName>A&amp;B</FullName>"), Text::npos);
@@ -155,10 +186,24 @@ TEST_F(CliTest, ConnectionAndSessionFailuresExitWith3) {
   EXPECT_NE(missing.err.find("Could not open the specified QuickBooks company data file."),
             std::string::npos);
 
+  fake_->begin = [](const Text&) -> Text {
+    throw test::processorError(static_cast<int32_t>(0x8004040A),
+                               u"There is already a company data file open and it is different "
+                               u"from the requested one.");
+  };
+  EXPECT_EQ(send({}).err,
+            "droqbxml: cannot begin a session on \"C:\\co.qbw\": another company file is open. "
+            "QuickBooks: \"There is already a company data file open and it is different from "
+            "the requested one.\" (0x8004040A)\n");
+
   fake_->open = [] {
     throw test::processorError(static_cast<int32_t>(0x80040401), u"Could not access QuickBooks.");
   };
-  EXPECT_EQ(send({}).code, cli::kExitConnection);
+  const Result closed = send({});
+  EXPECT_EQ(closed.code, cli::kExitConnection);
+  EXPECT_EQ(closed.err,
+            "droqbxml: cannot open a connection to QuickBooks: Could not access QuickBooks. "
+            "(0x80040401)\n");
 }
 
 TEST_F(CliTest, UnreadableRequestFileIsAUsageError) {

@@ -49,8 +49,8 @@ void createWithProbeTable(const std::filesystem::path& path, int rows = 0, int b
 TEST(CompanyFileTest, CreateKeepsTheSettingsAndRefusesAnExistingPath) {
   test::TemporaryFolder folder;
   const auto path = folder / "orvanne.qbw";
-  CompanyFile::create(path, {"Orvanne Builders", false});
-  CompanyFile::create(folder / "taxed.qbw", {"Taxed", true});
+  CompanyFile::create(path, {"Orvanne Builders", false, {}});
+  CompanyFile::create(folder / "taxed.qbw", {"Taxed", true, {}});
   EXPECT_TRUE(CompanyFile(folder / "taxed.qbw").settings().salesTax);
   {
     CompanyFile company(path);
@@ -142,7 +142,7 @@ TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
 TEST(CompanyFileTest, IntegratedApplicationsAndSummary) {
   test::TemporaryFolder folder;
   const auto path = folder / "apps.qbw";
-  CompanyFile::create(path, {"Tessaly & Sons", false});
+  CompanyFile::create(path, {"Tessaly & Sons", false, {}});
   const std::string counts =
       "Company: Tessaly & Sons\nSales tax: off\nCustomers and jobs: 0\nAccounts: 7\nItems: 0\n"
       "Sales tax codes: 2\nEstimates: 0\nInvoices: 0\n";

@@ -121,7 +121,7 @@ class RequestHandlersTest : public ::testing::Test {
   void newCompany(bool salesTax) {
     company_.reset();
     const auto path = folder_ / ("company" + std::to_string(++companies_) + ".qbw");
-    CompanyFile::create(path, CompanySettings{"Orvanne Builders", salesTax});
+    CompanyFile::create(path, CompanySettings{"Orvanne Builders", salesTax, {}});
     company_ = std::make_unique<CompanyFile>(path);
   }
 

@@ -55,6 +55,11 @@ constexpr Refusal kNoAutoLogin{
     u"This application is not allowed to log into this QuickBooks company data file "
     u"automatically. The QuickBooks administrator can grant permission for automatic login "
     u"through the Integrated Application preferences."};
+constexpr Refusal kNotYetAccessed{
+    Hresult::kNotYetAccessed,
+    u"This application has not accessed this QuickBooks company data file before.  Only the "
+    u"QuickBooks administrator can grant permission for an application to access a "
+    u"QuickBooks company data file for the first time."};
 
 // Asserts that `body` raises `refusal` from the request processor.
 ::testing::AssertionResult raises(const std::function<void()>& body, const Refusal& refusal) {
@@ -73,8 +78,8 @@ Text textOf(const std::filesystem::path& path) { return fromUtf8(path.string());
 class SimulatedProcessorTest : public ::testing::Test {
  protected:
   void SetUp() override {
-    CompanyFile::create(folder_ / "a.qbw", {"Company A", true});
-    CompanyFile::create(folder_ / "b.qbw", {"Company B", false});
+    CompanyFile::create(folder_ / "a.qbw", {"Company A", true, {"Tessaly", "First", "Second"}});
+    CompanyFile::create(folder_ / "b.qbw", {"Company B", false, {"Tessaly", "First", "Second", "Refused"}});
   }
   Text file(const std::string& name) const { return textOf(folder_ / name); }
   // A processor whose connection is open for the application `appName`.
@@ -195,7 +200,7 @@ TEST_F(SimulatedProcessorTest, OneCompanyFileIsOpenInAProcessAtATime) {
 TEST_F(SimulatedProcessorTest, PlatformPathsAreMappedAsTheComponentMapsThem) {
   test::TemporaryDrive drive;
   std::filesystem::create_directories(drive.path("Company Files"));
-  CompanyFile::create(drive.path("Company Files/Orvanne.qbw"), {});
+  CompanyFile::create(drive.path("Company Files/Orvanne.qbw"), {"My Company", true, {"Tessaly"}});
   const auto processor = connected();
   const Text path = u"C:\\Company Files\\Orvanne.qbw";
   const Text ticket = processor->BeginSession(path, kAny);
@@ -213,18 +218,16 @@ TEST_F(SimulatedProcessorTest, ApplicationsAreLetInAsTheCompanyFileSays) {
     company.setApplication("Refused", {false, true});
     company.setApplication("Attended", {true, false});
   }
-  const auto newcomer = connected(u"Newcomer");
-  newcomer->EndSession(newcomer->BeginSession(file("a.qbw"), kAny));
+  // Nobody is at the keyboard to approve an application the file has not seen.
+  EXPECT_REFUSED(connected(u"Newcomer")->BeginSession(file("a.qbw"), kAny), kNotYetAccessed);
   EXPECT_REFUSED(connected(u"Refused")->BeginSession(file("a.qbw"), kAny), kAccessDenied);
   EXPECT_REFUSED(connected(u"Attended")->BeginSession(file("a.qbw"), kAny), kNoAutoLogin);
   // A refused application does not keep the file open.
   const auto other = connected(u"Refused");
   other->EndSession(other->BeginSession(file("b.qbw"), kAny));
-  // A newcomer is added as allowed with automatic login; a refused one is left as it was.
+  // Refusals change nothing in the file.
   CompanyFile company(folder_ / "a.qbw");
-  const auto added = company.application("Newcomer");
-  ASSERT_TRUE(added.has_value());
-  EXPECT_TRUE(added->allowed && added->autoLogin);
+  EXPECT_FALSE(company.application("Newcomer").has_value());
   EXPECT_FALSE(company.application("Refused")->allowed);
 }
 
