@@ -210,6 +210,25 @@ TEST(RequestReaderTest, ReportsUnknownElementsAndStrayText) {
                    "CustomerAdd"}));
 }
 
+TEST(RequestReaderTest, ChecksTheDeclaredVersion) {
+  const auto customer = [](std::string_view version) {
+    return "<?qbxml version=\"" + std::string(version) +
+           "\"?>\n<QBXML><QBXMLMsgsRq onError=\"stopOnError\"><CustomerAddRq><CustomerAdd>"
+           "<Name>A</Name><ClassRef><FullName>B</FullName></ClassRef></CustomerAdd>"
+           "</CustomerAddRq></QBXMLMsgsRq></QBXML>";
+  };
+  EXPECT_EQ(problemsOf(customer("12.0")), Lines{});
+  EXPECT_EQ(problemsOf(customer("2.0")),
+            (Lines{"2 QBXML/QBXMLMsgsRq/CustomerAddRq/CustomerAdd/ClassRef: 'ClassRef' in "
+                   "CustomerAdd came with qbXML 12.0; this document is qbXML 2.0"}));
+  for (const char* unknown : {"14.0", "6.1", "3.5"}) {
+    EXPECT_EQ(problemsOf(customer(unknown)),
+              (Lines{"1 : qbXML version '" + std::string(unknown) +
+                     "' is not one QuickBooks Desktop knows (1.0, 1.1, 2.0, 2.1, 3.0, 4.0, 4.1, "
+                     "5.0 and every N.0 up to 13.0)"}));
+  }
+}
+
 TEST(RequestReaderTest, ReportsCardinalityAndChoices) {
   Lines lines{"<CustomerAddRq><CustomerAdd><Name>A</Name>", "<Name>B</Name>"};
   for (int i = 0; i < 9; ++i) {
