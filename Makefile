@@ -1,6 +1,6 @@
 # The two commands a new machine needs: `make test` and `make demo`. Both install any
 # missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
-.PHONY: all setup test bench demo com com-test format clean
+.PHONY: all setup test bench demo com com-test fault-check format clean
 
 all: test
 
@@ -45,6 +45,10 @@ demo: setup
 	cmake --preset release
 	cmake --build --preset release --target droqbxml_command
 	./build/release/cli/droqbxml demo
+
+# Deliberate faults, one per area, each of which the tests must catch (some minutes).
+fault-check: setup
+	python3 scripts/fault-check.py
 
 format:
 	clang-format -i $$(git ls-files '*.cpp' '*.hpp')
