@@ -1,6 +1,5 @@
-// The droqbxml command end to end against the embedded stand-in: lint and the demo, with
-// company files in a temporary folder (the other commands are in the table of
-// CliCommandsTest).
+// droqbxml demo end to end against the embedded stand-in, in a temporary folder (the other
+// commands are in the table of CliCommandsTest).
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -38,23 +37,6 @@ class CliStandInTest : public ::testing::Test {
   std::filesystem::path basFolder_;
   std::string company_;
 };
-
-TEST_F(CliStandInTest, LintNamesEachProblem) {
-  const Result built =
-      run({"build", "query", "customer", "--active", "all", "--from", "2026-01-01"});
-  ASSERT_EQ(built.code, cli::kExitSuccess);
-  EXPECT_EQ(run({"lint", "-"}, built.out).code, cli::kExitSuccess);
-  const std::string misordered =
-      "<?xml version=\"1.0\"?>\n<?qbxml version=\"13.0\"?>\n<QBXML>\n"
-      "<QBXMLMsgsRq onError=\"stopOnError\">\n<CustomerAddRq>\n<CustomerAdd>\n"
-      "<CompanyName>Acme</CompanyName>\n<Name>Kim</Name>\n</CustomerAdd>\n</CustomerAddRq>\n"
-      "</QBXMLMsgsRq>\n</QBXML>\n";
-  const Result lint = run({"lint", "-"}, misordered);
-  EXPECT_EQ(lint.code, cli::kExitNotSuccess);
-  EXPECT_NE(lint.out.find("<stdin>:7: QBXML/QBXMLMsgsRq/CustomerAddRq/CustomerAdd"),
-            std::string::npos)
-      << lint.out;
-}
 
 size_t countOf(const std::string& text, const std::string& what) {
   size_t count = 0;

@@ -1,5 +1,6 @@
-// The droqbxml command run in-process: argument handling, output and exit codes, against
-// a fake processor registered under a ProgID of its own.
+// The droqbxml command run in-process against a fake processor registered under a ProgID of
+// its own: what it sends and prints for the processor's answers and refusals (the rest of
+// the command is in the table of CliCommandsTest).
 #include <gtest/gtest.h>
 
 #include <sstream>
@@ -42,57 +43,6 @@ class CliTest : public ::testing::Test {
   test::TemporaryDrive drive_;
   std::shared_ptr<test::FakeProcessor> fake_ = std::make_shared<test::FakeProcessor>();
 };
-
-TEST_F(CliTest, EscapesAndUnescapes) {
-  EXPECT_EQ(run({"escape", "Tom's <A&B>"}).out, "Tom&apos;s &lt;A&amp;B&gt;\n");
-  EXPECT_EQ(run({"escape", "caf\xC3\xA9"}).out, "caf&#233;\n");
-  EXPECT_EQ(run({"unescape", "&amp;lt; &#65;"}).out, "&lt; A\n");
-  const Result bad = run({"unescape", "&#;"});
-  EXPECT_EQ(bad.code, cli::kExitUsage);
-  EXPECT_NE(bad.err.find("Type mismatch"), std::string::npos);
-}
-
-TEST_F(CliTest, BuildsQueryDocuments) {
-  const Result all = run({"build", "query", "item-inventory"});
-  EXPECT_EQ(all.code, cli::kExitSuccess);
-  EXPECT_EQ(
-      all.out,
-      "<?xml version=\"1.0\"?>\r\n<!DOCTYPE QBXML PUBLIC \"-//INTUIT//DTD QBXML QBD 1.0//EN\" "
-      ">\r\n<QBXML>\r\n\t<QBXMLMsgsRq onError=\"stopOnError\">\r\n\t\t<ItemInventoryQueryRq "
-      "requestID=\"2\" />\r\n\t</QBXMLMsgsRq>\r\n</QBXML>\n");
-  EXPECT_NE(
-      run({"build", "query", "item", "--full-name", "Labor", "--item-kind", "service"})
-          .out.find("<ItemServiceQueryRq requestID=\"2\">\r\n\t\t\t<FullName>Labor</FullName>"),
-      std::string::npos);
-  EXPECT_NE(
-      run({"build", "query", "customer", "--active", "all", "--from", "2004-01-01"})
-          .out.find("<ActiveStatus>All</ActiveStatus>\r\n\t\t\t<FromModifiedDate>2004-01-01<"),
-      std::string::npos);
-  EXPECT_NE(run({"build", "query", "ACCOUNT", "--list-id", " 80000001-1 "})
-                .out.find("<CustomerQueryRq requestID=\"2\">\r\n\t\t\t<ListID>80000001-1</ListID>"),
-            std::string::npos);
-}
-
-TEST_F(CliTest, RefusesBadArgumentsWithUsageCode) {
-  for (const std::vector<std::string>& args : std::vector<std::vector<std::string>>{
-           {},
-           {"frobnicate"},
-           {"build"},
-           {"build", "query", "vendor"},
-           {"build", "query", "item", "--full-name", "X"},
-           {"build", "query", "customer", "--from", "2004-01-01"},
-           {"build", "query", "customer", "--full-name", "A", "--list-id", "B"},
-           {"build", "query", "customer", "--active", "sometimes"},
-           {"send"},
-       }) {
-    const Result result = run(args);
-    EXPECT_EQ(result.code, cli::kExitUsage) << ::testing::PrintToString(args);
-    EXPECT_FALSE(result.err.empty());
-  }
-  const Result help = run({"query", "--help"});
-  EXPECT_EQ(help.code, cli::kExitSuccess);
-  EXPECT_NE(help.out.find("--item-kind"), std::string::npos);
-}
 
 TEST_F(CliTest, PrintsTheResponseAsReturnedAndSummarisesEachStatus) {
   fake_->process = [](const Text&) {

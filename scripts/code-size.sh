@@ -1,0 +1,10 @@
+#!/usr/bin/env bash
+# Lines of test code against lines of product code (the library, the stand-in, the command
+# and the COM server; the generated schema tables left out), as committed.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+count() { git ls-files "$@" | grep -v -e 'SchemaTables.inc$' -e "${exclude:-^$}" | xargs cat | wc -l; }
+product=$(exclude='^com/tests/' count 'droqbxml/*.cpp' 'droqbxml/*.hpp' 'simulator/*.cpp' 'simulator/*.hpp' \
+  'cli/*.cpp' 'cli/*.hpp' 'com/*.cpp' 'com/*.hpp' 'com/*.S')
+tests=$(count 'tests/*.cpp' 'tests/*.hpp' 'tests/*.vbs' 'tests/*.js' 'com/tests/*.cpp')
+echo "product $product lines, tests $tests lines: tests are $((100 * tests / product))% of product"
