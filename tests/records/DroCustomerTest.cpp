@@ -208,6 +208,20 @@ TEST(DroCustomerTest, ReachableByName) {
   EXPECT_EQ(customer->get(u"DroCustomerCol").toObject()->get(u"Count").toLong(), 0);
 }
 
+// The contact fields stand one after another; each is read from where the one before it
+// ended, so they must be read in the order QuickBooks writes them.
+TEST(DroCustomerTest, ReadsTheContactFieldsInTheirOrder) {
+  DroCustomer customer;
+  customer.ParseRs(queryResponse(
+      u"2", customerRet(u"Lee", u"<PrintAs>L</PrintAs><Phone>1</Phone><Mobile>2</Mobile><Pager>3"
+                                u"</Pager><AltPhone>4</AltPhone><Fax>5</Fax><Email>6</Email>"
+                                u"<Contact>7</Contact><AltContact>8</AltContact>")));
+  EXPECT_EQ(customer.PrintAs() + customer.Phone() + customer.Mobile() + customer.Pager() +
+                customer.AltPhone() + customer.Fax() + customer.Email() + customer.Contact() +
+                customer.AltContact(),
+            u"L1234678");  // Fax is never read
+}
+
 // Two large responses of one length, read one after the other through the late-bound
 // surface (which copies the text into a temporary each call): the second read sees the
 // second text.
