@@ -21,7 +21,7 @@ FAULTS = [
      'writeElementIfSet(builder, u"FirstName", cust.FirstName());\n'
      '  writeElementIfSet(builder, u"Salutation", cust.Salutation());'),
     ("value checks", "droqbxml/qbxml/basValidations.cpp",
-     "text.size() - point - 1 > kAmountDecimals", "text.size() - point - 1 > kAmountDecimals + 1"),
+     "*amount > kAmountLimit) {", "*amount > kAmountLimit + 1) {"),
     ("wrapper status", "droqbxml/connection/DroXmlSdkWrapper.cpp",
      "if (containsAnyUpper(upper, kEstimateTaxMessages)) {",
      "if (containsAnyUpper(upper, kInvoiceTaxMessages)) {"),
