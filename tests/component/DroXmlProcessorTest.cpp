@@ -1,11 +1,10 @@
 // The facade: what a new one holds and how it shares the per-thread values.
-#include "droqbxml/component/DroXmlProcessor.hpp"
-
 #include <gtest/gtest.h>
 
 #include <thread>
 
 #include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/component/DroXmlProcessor.hpp"
 #include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/runtime/Binding.hpp"
 #include "tests/TestSupport.hpp"
@@ -28,33 +27,20 @@ void onFreshThread(F body) {
   std::thread(body).join();
 }
 
-TEST(DroXmlProcessorTest, NewFacadeHoldsBuilderWrapperAndTheDefaultPath) {
-  onFreshThread([] {
-    DroXmlProcessor facade;
-    EXPECT_EQ(facade.DroPath(), u"C:\\Program Files\\Orvanne\\Tessaly");
-    EXPECT_NE(facade.XML(), nullptr);
-    EXPECT_NE(facade.API(), nullptr);
-    EXPECT_EQ(facade.qbXMLItemsCol(), nullptr);
-    EXPECT_EQ(facade.XML()->XML(), u"");
-  });
-}
-
-TEST(DroXmlProcessorTest, EveryCreationResetsTheSharedPath) {
-  onFreshThread([] {
-    DroXmlProcessor first;
-    first.DroPath(u" D:\\Apps ");
-    EXPECT_EQ(first.DroPath(), u" D:\\Apps ");
-    DroXmlProcessor second;
-    EXPECT_EQ(first.DroPath(), u"C:\\Program Files\\Orvanne\\Tessaly");
-  });
-}
-
-TEST(DroXmlProcessorTest, SharedValuesOutliveTheFacade) {
+// A new facade holds a fresh builder and wrapper and resets the shared path; the items
+// collection and the error object it shares outlive it.
+TEST(DroXmlProcessorTest, NewFacadeResetsThePathAndSharesTheThreadsValues) {
   onFreshThread([] {
     auto items = std::make_shared<ItemsColStandIn>();
     Ref<clsMyErr> err;
     {
       DroXmlProcessor facade;
+      EXPECT_EQ(facade.XML()->XML(), u"");
+      EXPECT_EQ(facade.qbXMLItemsCol(), nullptr);
+      facade.DroPath(u" D:\\Apps ");
+      EXPECT_EQ(facade.DroPath(), u" D:\\Apps ");
+      DroXmlProcessor second;
+      EXPECT_EQ(facade.DroPath(), u"C:\\Program Files\\Orvanne\\Tessaly");
       facade.qbXMLItemsCol(items);
       facade.qbXMLItemsCol(std::make_shared<clsMyErr>());  // another class: ignored
       EXPECT_EQ(facade.qbXMLItemsCol(), items);
