@@ -1,11 +1,10 @@
 // Trace output and its one-open-file rule.
-#include "droqbxml/diagnostics/clsTrace.hpp"
-
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/diagnostics/clsMyErr.hpp"
+#include "droqbxml/diagnostics/clsTrace.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -19,12 +18,6 @@ constexpr TextView kFile = u"C:\\trace.txt";
 bool raisesSecondFile(const std::function<void()>& body) {
   return raises(body, TOO_MANY_OPEN_TRACE_FILES, u"clsTrace.FileOpen",
                 u"Cannot have more than one Trace file open at the same time.");
-}
-
-TEST(clsTraceTest, DebugWritesNothingAndUnknownStreamsFail) {
-  clsTrace trace;
-  EXPECT_TRUE(trace.Trace(u"x", eOutToDebug));
-  EXPECT_FALSE(trace.Trace(u"x", static_cast<eudOutStreamStype>(5)));
 }
 
 TEST(clsTraceTest, AppendsAndOverwritesLines) {
@@ -54,9 +47,12 @@ TEST(clsTraceTest, FileFailuresLeaveTheObjectMarkedOpen) {
   test::TemporaryDrive drive;
   clsTrace badAction;
   EXPECT_TRUE(test::raisesRuntime(
-      [&] { badAction.Trace(u"x", eOutToFile, Text(kFile), static_cast<eudTraceFileAction>(7), true); },
+      [&] {
+        badAction.Trace(u"x", eOutToFile, Text(kFile), static_cast<eudTraceFileAction>(7), true);
+      },
       RuntimeError::kBadFileNameOrNumber));
-  EXPECT_TRUE(raisesSecondFile([&] { badAction.Trace(u"x", eOutToFile, Text(kFile), eAppend, true); }));
+  EXPECT_TRUE(
+      raisesSecondFile([&] { badAction.Trace(u"x", eOutToFile, Text(kFile), eAppend, true); }));
 
   clsTrace noName;
   EXPECT_TRUE(test::raisesRuntime([&] { noName.Trace(u"x", eOutToFile); },
@@ -67,6 +63,7 @@ TEST(clsTraceTest, FileFailuresLeaveTheObjectMarkedOpen) {
       RuntimeError::kPathNotFound));
 }
 
+// By name, with the arguments left out: stream 0 (debug) writes nothing, 2 is no stream.
 TEST(clsTraceTest, ReachableByNameWithDefaults) {
   test::TemporaryDrive drive;
   const auto trace = CreateObject(u"DroQbXml.clsTrace");
