@@ -208,15 +208,7 @@ TEST(DroXmlBuilderTest, ElementsAndAttributesAreWrittenAsGiven) {
   b.AddElement(unnamed);  // first name empty: no attribute is written at all
   b.AddAggregateBegin(unnamed);
   b.AddAggregateEnd();
-  EXPECT_EQ(b.XML(),
-            u"\t<Name />\r\n"
-            u"\t<Name>A&amp;B</Name>\r\n"
-            u"\t<Name>  </Name>\r\n"
-            u"\t<Name>a&#13;&#10;&#1;</Name>\r\n"
-            u"\t<Rq q=\"say \"hi\"\" n=\"\">a&b</Rq>\r\n"
-            u"\t<Rq />\r\n"
-            u"\t<Rq>\r\n"
-            u"\t</Rq>\r\n");
+  EXPECT_TRUE(test::matchesGolden(b.XML(), "requests/elements_as_given.xml"));
   EXPECT_TRUE(raisesRuntime([&] { b.AddElement(nullptr); }, RuntimeError::kObjectNotSet));
   EXPECT_TRUE(raisesRuntime([&] { b.AddAggregateBegin(nullptr); }, RuntimeError::kObjectNotSet));
 }

@@ -14,44 +14,44 @@ namespace {
 
 using test::raisesRuntime;
 
-TEST(DroXmlElementTest, NewElementHasNoAttributes) {
+TEST(DroXmlElementTest, NamesAreTrimmedOfBlanksAndAttributesKeptInOrder) {
   DroXmlElement elem;
-  EXPECT_EQ(elem.AttributeCount(), 0);
-  EXPECT_FALSE(elem.AttributesUsed());
-  EXPECT_EQ(elem.Name(), u"");
-  EXPECT_EQ(elem.Value(), u"");
   for (const int16_t index : {int16_t{0}, int16_t{5}, int16_t{-1}}) {
     EXPECT_EQ(elem.AttributeName(index), u"") << index;
     EXPECT_EQ(elem.AttributeValue(index), u"") << index;
   }
-}
-
-TEST(DroXmlElementTest, NameIsTrimmedValueIsNot) {
-  DroXmlElement elem;
+  EXPECT_FALSE(elem.AttributesUsed());
   elem.Name(u"  A\t ");
   elem.Value(u"  A  ");
   EXPECT_EQ(elem.Name(), u"A\t");  // blanks only
   EXPECT_EQ(elem.Value(), u"  A  ");
-}
-
-TEST(DroXmlElementTest, AttributesAreTrimmedAndKeptInOrder) {
-  DroXmlElement elem;
   elem.AttributeAdd(u" requestID ", u" 2 ");
-  EXPECT_TRUE(elem.AttributesUsed());
-  EXPECT_EQ(elem.AttributeCount(), 1);
-  EXPECT_EQ(elem.AttributeName(0), u"requestID");
-  EXPECT_EQ(elem.AttributeValue(0), u"2");
-
   elem.AttributeAdd(u"b", u"x");
   elem.AttributeAdd(u"b", u"");  // duplicates are kept
+  EXPECT_TRUE(elem.AttributesUsed());
   EXPECT_EQ(elem.AttributeCount(), 3);
+  EXPECT_EQ(elem.AttributeName(0), u"requestID");
+  EXPECT_EQ(elem.AttributeValue(0), u"2");
   EXPECT_EQ(elem.AttributeName(1), u"b");
   EXPECT_EQ(elem.AttributeValue(1), u"x");
   EXPECT_EQ(elem.AttributeName(2), u"b");
   EXPECT_EQ(elem.AttributeValue(2), u"");
   EXPECT_EQ(elem.AttributeName(3), u"");
+  // Clearing, and Class_Initialize, drop the attributes but keep name and value.
+  elem.AttributesClear();
+  EXPECT_FALSE(elem.AttributesUsed());
+  EXPECT_EQ(elem.AttributeCount(), 0);
+  EXPECT_EQ(elem.AttributeName(0), u"");
+  EXPECT_EQ(elem.AttributeName(2), u"");
+  elem.AttributeAdd(u"c", u"3");
+  EXPECT_EQ(elem.AttributeName(0), u"c");
+  elem.Class_Initialize();
+  EXPECT_EQ(elem.AttributeCount(), 0);
+  EXPECT_EQ(elem.Name(), u"A\t");
+  EXPECT_EQ(elem.Value(), u"  A  ");
 }
 
+// Deliberate: an empty first name counts no attributes, though they are used and kept.
 TEST(DroXmlElementTest, EmptyFirstNameCountsNoAttributesThoughUsed) {
   DroXmlElement elem;
   elem.AttributeAdd(u"   ", u"x");
@@ -60,27 +60,6 @@ TEST(DroXmlElementTest, EmptyFirstNameCountsNoAttributesThoughUsed) {
   EXPECT_EQ(elem.AttributeCount(), 0);
   EXPECT_EQ(elem.AttributeValue(0), u"x");
   EXPECT_EQ(elem.AttributeName(1), u"b");
-}
-
-TEST(DroXmlElementTest, ClearingReturnsToTheNewStateButKeepsNameAndValue) {
-  DroXmlElement elem;
-  elem.Name(u"N");
-  elem.Value(u"V");
-  elem.AttributeAdd(u"a", u"1");
-  elem.AttributeAdd(u"b", u"2");
-  elem.AttributesClear();
-  EXPECT_FALSE(elem.AttributesUsed());
-  EXPECT_EQ(elem.AttributeCount(), 0);
-  EXPECT_EQ(elem.AttributeName(0), u"");
-  EXPECT_EQ(elem.AttributeName(1), u"");
-
-  elem.AttributeAdd(u"c", u"3");
-  EXPECT_EQ(elem.AttributeCount(), 1);
-  EXPECT_EQ(elem.AttributeName(0), u"c");
-  elem.Class_Initialize();
-  EXPECT_EQ(elem.AttributeCount(), 0);
-  EXPECT_EQ(elem.Name(), u"N");
-  EXPECT_EQ(elem.Value(), u"V");
 }
 
 TEST(DroXmlElementTest, AttributeIndexIsSixteenBit) {

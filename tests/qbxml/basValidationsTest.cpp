@@ -38,6 +38,12 @@ Text strCheck(const Text& value, int16_t maxLen, bool truncate) {
   return CheckSTRTYPE(value, maxLen, truncate);
 }
 
+// A value and what its check gives back.
+struct Normalised {
+  const char16_t* value;
+  const char16_t* expected;
+};
+
 TEST(basValidationsTest, EmptyTextPassesEveryCheck) {
   for (Check check : {&CheckWageType, &CheckJobStatus, &CheckAccountType, &CheckAMTTYPE,
                       &CheckBOOLTYPE, &CheckDATETYPE, &CheckDATETIMETYPE, &CheckPRICETYPE,
@@ -97,10 +103,7 @@ TEST(basValidationsTest, ClosedListsRefuseOtherValuesUntrimmed) {
 }
 
 TEST(basValidationsTest, AmountsGetTwoDecimals) {
-  const struct {
-    const char16_t* value;
-    const char16_t* expected;
-  } cases[] = {
+  const Normalised cases[] = {
       {u"12.5", u"12.50"},
       {u"0.5", u".50"},
       {u"-0.5", u"-.50"},
@@ -194,10 +197,7 @@ TEST(basValidationsTest, StringsAreCutOrRefusedBeyondTheirLimit) {
 }
 
 TEST(basValidationsTest, DatesKeepTheirFirstTenCharacters) {
-  const struct {
-    const char16_t* value;
-    const char16_t* expected;
-  } cases[] = {
+  const Normalised cases[] = {
       {u"2004-02-29", u"2004-02-29"},
       // No leap-year rule: the 29th of February passes in every year.
       {u"2003-02-29", u"2003-02-29"},
@@ -231,10 +231,7 @@ TEST(basValidationsTest, DatesRefusedOrNotConverted) {
 }
 
 TEST(basValidationsTest, PricesKeepFourDecimalsWrittenWithFive) {
-  const struct {
-    const char16_t* value;
-    const char16_t* expected;
-  } cases[] = {
+  const Normalised cases[] = {
       {u"12.5", u"12.50000"},
       {u"0.5", u".50000"},
       {u"+5", u"5.00000"},
@@ -255,10 +252,7 @@ TEST(basValidationsTest, PricesKeepFourDecimalsWrittenWithFive) {
 }
 
 TEST(basValidationsTest, QuantitiesWithFiveDecimalsWithinRange) {
-  const struct {
-    const char16_t* value;
-    const char16_t* expected;
-  } cases[] = {
+  const Normalised cases[] = {
       {u"2.5", u"2.50000"},
       {u"1.234567", u"1.23457"},
       {u"0.000001", u".00000"},
