@@ -91,7 +91,8 @@ TEST(DroAccountTest, DumpOpensWithFalse) {
   EXPECT_TRUE(test::matchesGolden(DroAccount().PrintOut(), "records/account_new.txt"));
 }
 
-TEST(DroAccountColTest, CollectsAccountsByName) {
+// Every record collection is one template: this one stands for the customers' too.
+TEST(DroAccountColTest, CollectsRecordsByPositionOrKey) {
   const auto col = CreateObject(u"DroQbXml.DroAccountCol");
   const auto first = col->call(u"Add").toObject();
   const auto bank = std::make_shared<DroAccount>();
@@ -99,12 +100,21 @@ TEST(DroAccountColTest, CollectsAccountsByName) {
   EXPECT_EQ(col->get(u"Count").toLong(), 2);
   EXPECT_EQ(col->call(u"Item", {Variant(1)}).toObject(), first);
   EXPECT_EQ(col->call(u"Item", {Variant(u"b")}).toObject(), bank);
+  EXPECT_TRUE(test::raisesRuntime([&] { col->call(u"Item", {Variant(u"1")}); },
+                                  RuntimeError::kInvalidProcedureCall));  // text is a key
   EXPECT_TRUE(test::raisesRuntime([&] { col->call(u"Add", {Variant(u"B")}); },
                                   RuntimeError::kDuplicateKey));
   EXPECT_EQ(col->get(u"Count").toLong(), 2);
+  // NewEnum gives an enumerator over a snapshot, as For Each sees it.
+  const auto each = col->call(u"NewEnum").toObject();
   col->call(u"Remove", {Variant(u"B")});
+  EXPECT_EQ(each->call(u"Next").toObject(), first);
+  EXPECT_EQ(each->call(u"Next").toObject(), bank);
+  EXPECT_TRUE(each->call(u"Next").isEmpty());
   EXPECT_TRUE(test::raisesRuntime([&] { col->call(u"Item", {Variant(2)}); },
                                   RuntimeError::kInvalidProcedureCall));
+  col->call(u"Remove", {Variant(1)});
+  EXPECT_EQ(col->get(u"Count").toLong(), 0);
   const auto account = CreateObject(u"DroQbXml.DroAccount");
   account->get(u"ParentRef").toObject()->let(u"FullName", u"Assets");
   EXPECT_NE(account->get(u"PrintOut").toText().find(u"FullName\r\n\tAssets"), Text::npos);

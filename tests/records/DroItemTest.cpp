@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
-#include "droqbxml/component/DroXmlProcessor.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/records/DroItemDiscount.hpp"
 #include "droqbxml/records/DroItemGroup.hpp"
@@ -203,13 +202,6 @@ TEST(DroItemsColTest, AddsOnlySixKinds) {
       test::raisesRuntime([&] { items.Add(Variant(0), u"t"); }, RuntimeError::kDuplicateKey));
   EXPECT_EQ(items.Count(), 3);
   EXPECT_EQ(items.Item(Variant(1)), tax);
-  // The facade keeps a DroItemsCol as the shared collection, and nothing else.
-  DroXmlProcessor facade;
-  const auto shared = std::make_shared<DroItemsCol>();
-  facade.qbXMLItemsCol(std::make_shared<DroItemGroupLineCol>());
-  EXPECT_EQ(facade.qbXMLItemsCol(), nullptr);
-  facade.qbXMLItemsCol(shared);
-  EXPECT_EQ(facade.qbXMLItemsCol(), shared);
   // By name, Add returns nothing for an unsupported kind.
   const auto col = CreateObject(u"DroQbXml.DroItemsCol");
   EXPECT_TRUE(col->call(u"Add", {Variant(3)}).toObject() == nullptr);
