@@ -18,6 +18,17 @@ using test::raises;
 constexpr TextView kMismatch =
     u"There is already a company data file open and it is different from the requested one.";
 
+// A processor step that fails with this HRESULT and message.
+std::function<Text(const Text&)> refuses(uint32_t hresult, TextView message) {
+  return [=, text = Text(message)](const Text&) -> Text {
+    throw processorError(static_cast<int32_t>(hresult), text);
+  };
+}
+std::function<void()> fails(uint32_t hresult, TextView message) {
+  return [=, text = Text(message)] { throw processorError(static_cast<int32_t>(hresult), text); };
+}
+int32_t hr(uint32_t hresult) { return static_cast<int32_t>(hresult); }
+
 Text responseWith(TextView statusAndMessage) {
   return u"<?xml version=\"1.0\" ?>\n<QBXML>\n<QBXMLMsgsRs>\n<CustomerQueryRs requestID=\"2\" " +
          Text(statusAndMessage) + u" />\n</QBXMLMsgsRs>\n</QBXML>\n";
@@ -130,21 +141,17 @@ TEST_F(DroXmlSdkWrapperTest, TaxMessagesRefineStatus3140) {
 TEST_F(DroXmlSdkWrapperTest, ProcessorFailuresBecomeTheResponse) {
   DroXmlSdkWrapper wrapper;
   auto shared = basGlobals::SharedErrorObject();
-  registration_.fake->process = [](const Text&) -> Text {
-    throw processorError(static_cast<int32_t>(0x80040400),
-                         u"QuickBooks found an error when parsing the provided XML text stream.");
-  };
+  registration_.fake->process =
+      refuses(0x80040400, u"QuickBooks found an error when parsing the provided XML text stream.");
   EXPECT_EQ(wrapper.ProcessRequest(u"<bad"),
             u"QuickBooks found an error when parsing the provided XML text stream.");
   EXPECT_EQ(wrapper.ResponseStatus(), RSParsingError);
   EXPECT_EQ(shared->Number(), 0);  // nothing recorded
 
-  registration_.fake->process = [](const Text&) -> Text {
-    throw processorError(static_cast<int32_t>(0x8004040D), u"The ticket parameter is invalid.");
-  };
+  registration_.fake->process = refuses(0x8004040D, u"The ticket parameter is invalid.");
   EXPECT_EQ(wrapper.ProcessRequest(u"<x/>"), u"The ticket parameter is invalid.");
   EXPECT_EQ(wrapper.ResponseStatus(), RSUnknown);
-  EXPECT_EQ(shared->Number(), static_cast<int32_t>(0x8004040D));
+  EXPECT_EQ(shared->Number(), hr(0x8004040D));
   EXPECT_EQ(shared->Source(), u"DroXmlSdkWrapper.ProcessRequest");
 
   // A status code without its closing quote fails inside the exchange: the raw response
@@ -155,7 +162,7 @@ TEST_F(DroXmlSdkWrapperTest, ProcessorFailuresBecomeTheResponse) {
   EXPECT_EQ(shared->Number(), RuntimeError::kInvalidProcedureCall);
 }
 
-TEST_F(DroXmlSdkWrapperTest, SessionBeginMapsRefusals) {
+TEST_F(DroXmlSdkWrapperTest, SessionBeginMapsRefusalsAndRaisesOtherFailures) {
   DroXmlSdkWrapper wrapper;
   wrapper.SessionBegin();
   EXPECT_EQ(wrapper.ResponseStatus(), RSUnsetCoFile);
@@ -167,11 +174,17 @@ TEST_F(DroXmlSdkWrapperTest, SessionBeginMapsRefusals) {
   EXPECT_EQ(registration_.fake->calls.back(), "BeginSession(C:\\co.qbw,2)");
   EXPECT_EQ(wrapper.ResponseStatus(), RSUnsetCoFile);  // success leaves the status alone
 
-  registration_.fake->begin = [](const Text&) -> Text {
-    throw processorError(static_cast<int32_t>(0x8004040A), kMismatch);
-  };
+  registration_.fake->begin = refuses(0x8004040A, kMismatch);
   wrapper.SessionBegin();
   EXPECT_EQ(wrapper.ResponseStatus(), RSCoNameMismatch);
+  // The mismatch message is compared whole: with anything added it is an ordinary failure,
+  // raised after closing the connection.
+  const Text longer = Text(kMismatch) + u" ";
+  registration_.fake->begin = refuses(0x8004040A, longer);
+  EXPECT_TRUE(raises([&] { wrapper.SessionBegin(); }, hr(0x8004040A),
+                     u"DroXmlSdkWrapper.SessionBegin", longer));
+  EXPECT_EQ(registration_.fake->calls.back(), "CloseConnection");
+  EXPECT_EQ(wrapper.ResponseStatus(), RSCoNameMismatch);  // left as the last refusal set it
 
   for (const TextView refusal :
        {TextView(u"This application is not allowed to log into this QuickBooks company data "
@@ -181,26 +194,10 @@ TEST_F(DroXmlSdkWrapperTest, SessionBeginMapsRefusals) {
                  u"information.")}) {
     DroXmlSdkWrapper fresh;
     fresh.CompanyFilePath(u"C:\\co.qbw");
-    registration_.fake->begin = [refusal](const Text&) -> Text {
-      throw processorError(static_cast<int32_t>(0x8004041D), refusal);
-    };
+    registration_.fake->begin = refuses(0x8004041D, refusal);
     fresh.SessionBegin();
     EXPECT_EQ(fresh.ResponseStatus(), RSCantLogin);
   }
-}
-
-TEST_F(DroXmlSdkWrapperTest, SessionBeginRaisesOtherFailuresAfterClosing) {
-  DroXmlSdkWrapper wrapper;
-  wrapper.CompanyFilePath(u"C:\\co.qbw");
-  // The mismatch message is compared whole: with anything added it is an ordinary failure.
-  const Text longer = Text(kMismatch) + u" ";
-  registration_.fake->begin = [longer](const Text&) -> Text {
-    throw processorError(static_cast<int32_t>(0x8004040A), longer);
-  };
-  EXPECT_TRUE(raises([&] { wrapper.SessionBegin(); }, static_cast<int32_t>(0x8004040A),
-                     u"DroXmlSdkWrapper.SessionBegin", longer));
-  EXPECT_EQ(registration_.fake->calls.back(), "CloseConnection");
-  EXPECT_EQ(wrapper.ResponseStatus(), RSUnknown);
 }
 
 TEST_F(DroXmlSdkWrapperTest, SessionBeginOpensTheConnectionWhenAskedTo) {
@@ -210,8 +207,7 @@ TEST_F(DroXmlSdkWrapperTest, SessionBeginOpensTheConnectionWhenAskedTo) {
   registration_.fake->open = [&] { opened = true; };
   registration_.fake->begin = [&](const Text&) -> Text {
     if (!opened) {
-      throw processorError(static_cast<int32_t>(0x80040402),
-                           u"The method \"OpenConnection\" has not been called.");
+      throw processorError(hr(0x80040402), u"The method \"OpenConnection\" has not been called.");
     }
     return u"ticket-2";
   };
@@ -223,10 +219,8 @@ TEST_F(DroXmlSdkWrapperTest, SessionBeginOpensTheConnectionWhenAskedTo) {
 
   // Against an OpenConnection that fails, the retry ends with its error.
   opened = false;
-  registration_.fake->open = [] {
-    throw processorError(static_cast<int32_t>(0x80040401), u"Could not access QuickBooks.");
-  };
-  EXPECT_TRUE(raises([&] { wrapper.SessionBegin(); }, static_cast<int32_t>(0x80040401),
+  registration_.fake->open = fails(0x80040401, u"Could not access QuickBooks.");
+  EXPECT_TRUE(raises([&] { wrapper.SessionBegin(); }, hr(0x80040401),
                      u"DroXmlSdkWrapper.ConnectionOpen", u"Could not access QuickBooks."));
 }
 
@@ -236,19 +230,14 @@ TEST_F(DroXmlSdkWrapperTest, SessionEndRecordsOnlyTheBeginSessionMessage) {
   wrapper.SessionBegin();
   wrapper.SessionEnd();
   EXPECT_EQ(wrapper.SessionTicket(), u"");
-  registration_.fake->end = [] {
-    throw processorError(static_cast<int32_t>(0x80040402),
-                         u"The \"BeginSession\" method has not been called or did not succeed.");
-  };
-  EXPECT_TRUE(raises([&] { wrapper.SessionEnd(); }, static_cast<int32_t>(0x80040402),
-                     u"DroXmlSdkWrapper.SessionEnd",
+  registration_.fake->end =
+      fails(0x80040402, u"The \"BeginSession\" method has not been called or did not succeed.");
+  EXPECT_TRUE(raises([&] { wrapper.SessionEnd(); }, hr(0x80040402), u"DroXmlSdkWrapper.SessionEnd",
                      u"The \"BeginSession\" method has not been called or did not succeed."));
   basGlobals::SharedErrorObject()->Clear();
-  registration_.fake->end = [] {
-    throw processorError(static_cast<int32_t>(0x8004040D), u"The ticket parameter is invalid.");
-  };
-  EXPECT_TRUE(raises([&] { wrapper.SessionEnd(); }, static_cast<int32_t>(0x8004040D),
-                     u"QBXMLRP.RequestProcessor.1", u"The ticket parameter is invalid."));
+  registration_.fake->end = fails(0x8004040D, u"The ticket parameter is invalid.");
+  EXPECT_TRUE(raises([&] { wrapper.SessionEnd(); }, hr(0x8004040D), u"QBXMLRP.RequestProcessor.1",
+                     u"The ticket parameter is invalid."));
   EXPECT_EQ(basGlobals::SharedErrorObject()->Number(), 0);  // passed through, not recorded
 }
 
@@ -261,9 +250,7 @@ TEST_F(DroXmlSdkWrapperTest, TestForSdkComms) {
       (std::vector<std::string>{"OpenConnection(4093-27-,Tessaly)", "BeginSession(C:\\co.qbw,2)",
                                 "EndSession(ticket-1)", "CloseConnection"}));
   registration_.fake->calls.clear();
-  registration_.fake->begin = [](const Text&) -> Text {
-    throw processorError(static_cast<int32_t>(0x8004040A), kMismatch);
-  };
+  registration_.fake->begin = refuses(0x8004040A, kMismatch);
   DroXmlSdkWrapper other;
   EXPECT_FALSE(other.TestForSdkComms(u"C:\\other.qbw"));
   EXPECT_EQ(other.ResponseStatus(), RSCoNameMismatch);
@@ -332,9 +319,9 @@ TEST_F(WrapperWithoutProcessorTest, TreatsTheUnsetObjectLikeAProcessorError) {
 
 TEST_F(WrapperWithoutProcessorTest, OtherCreationFailuresAreRaised) {
   registerRequestProcessor(kRequestProcessorProgId, []() -> std::shared_ptr<RequestProcessor> {
-    throw processorError(static_cast<int32_t>(0x80040408), u"Could not start QuickBooks.");
+    throw processorError(hr(0x80040408), u"Could not start QuickBooks.");
   });
-  EXPECT_TRUE(raises([] { DroXmlSdkWrapper wrapper; }, static_cast<int32_t>(0x80040408),
+  EXPECT_TRUE(raises([] { DroXmlSdkWrapper wrapper; }, hr(0x80040408),
                      u"DroXmlSdkWrapper.Class_Initialize.CreateQbXmlObject",
                      u"Could not start QuickBooks."));
 }
