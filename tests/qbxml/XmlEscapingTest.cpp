@@ -1,11 +1,10 @@
 // The escaper and unescaper, directly and through clsXmlStringEscaping by name.
-#include "droqbxml/qbxml/XmlEscaping.hpp"
-
 #include <gtest/gtest.h>
 
 #include <random>
 
 #include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/qbxml/XmlEscaping.hpp"
 #include "droqbxml/runtime/Codepage.hpp"
 #include "tests/TestSupport.hpp"
 
@@ -27,7 +26,8 @@ TEST(XmlEscapingTest, WritesEntitiesAndCodePageReferences) {
   EXPECT_EQ(escape(u"\u4e2d"), u"\u4e2d");
   EXPECT_EQ(XMLEscapeString(u"\u4e2d\u20ac", true), u"&#20013;&#8364;");
   EXPECT_EQ(XMLEscapeChar(u"<<", false), u"&lt;");
-  EXPECT_TRUE(raisesRuntime([] { XMLEscapeChar(u"", false); }, RuntimeError::kInvalidProcedureCall));
+  EXPECT_TRUE(
+      raisesRuntime([] { XMLEscapeChar(u"", false); }, RuntimeError::kInvalidProcedureCall));
   // Any code unit escapes: NUL, lone surrogates, U+FFFF.
   const Text odd{char16_t{0}, char16_t{0xD800}, char16_t{0xFFFF}};
   EXPECT_EQ(escape(odd), u"&#0;" + odd.substr(1));
@@ -48,9 +48,6 @@ TEST(XmlEscapingTest, LimitCountsOnlyForIntegerKindsAndDropsCutEntities) {
   EXPECT_EQ(escape(u"ABC", u"0"), u"");
   EXPECT_EQ(escape(u"ABC"), u"ABC");
   EXPECT_TRUE(raisesRuntime([] { escape(u"ABC", u"x"); }, RuntimeError::kTypeMismatch));
-}
-
-TEST(XmlEscapingTest, PartialEntities) {
   EXPECT_TRUE(EndsInPartialEntity(u"AB&am"));
   EXPECT_FALSE(EndsInPartialEntity(u"AB&amp;"));
   EXPECT_FALSE(EndsInPartialEntity(u"AB"));
@@ -60,7 +57,7 @@ TEST(XmlEscapingTest, PartialEntities) {
   EXPECT_EQ(CutPartialEntity(u"AB&amp;"), u"AB&amp;");
 }
 
-TEST(XmlEscapingTest, UnescapesEntitiesThenDecimalReferences) {
+TEST(XmlEscapingTest, UnescapesEntitiesThenDecimalReferencesEverywhereWhenMet) {
   EXPECT_EQ(unescape(u"&amp;lt;"), u"&lt;");
   EXPECT_EQ(unescape(u"&#65;&#66;"), u"AB");
   EXPECT_EQ(unescape(u"&#x41;"), u"&#x41;");
@@ -70,18 +67,12 @@ TEST(XmlEscapingTest, UnescapesEntitiesThenDecimalReferences) {
   EXPECT_EQ(unescape(u"&#0065;&#128;&#233;"), u"A\u20ac\u00e9");
   EXPECT_EQ(XMLUnEscapeText(u"&#8364;&#65535;", true), u"\u20ac\uffff");
   EXPECT_EQ(unescape(u"&#0;"), Text(1, char16_t{0}));
-}
-
-TEST(XmlEscapingTest, ReplacesEachReferenceEverywhereWhenMet) {
   // "&#38;" becomes "&" everywhere at once; the "&#65;" it forms is before the scan and
   // stays, unless a later "&#65;" is met and replaced everywhere.
   EXPECT_EQ(unescape(u"&#38;#65;"), u"&#65;");
   EXPECT_EQ(unescape(u"&#38;#65;&#65;"), u"AA");
   EXPECT_EQ(unescape(u"&#6&#53;;"), u"&#65;");
   EXPECT_EQ(unescape(u"x&#59;&#59;"), u"x;;");
-}
-
-TEST(XmlEscapingTest, UnescapingFailsOnEmptyAndImpossibleReferences) {
   EXPECT_TRUE(raisesRuntime([] { unescape(u"a&#;b"); }, RuntimeError::kTypeMismatch));
   EXPECT_TRUE(raisesRuntime([] { unescape(u"&#256;"); }, RuntimeError::kInvalidProcedureCall));
   EXPECT_TRUE(raisesRuntime([] { XMLUnEscapeText(u"&#65536;", true); },

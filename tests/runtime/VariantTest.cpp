@@ -1,9 +1,8 @@
 // Variant kinds, their platform names and conversions.
-#include "droqbxml/runtime/Variant.hpp"
-
 #include <gtest/gtest.h>
 
 #include "droqbxml/diagnostics/clsMyErr.hpp"
+#include "droqbxml/runtime/Variant.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -43,15 +42,15 @@ TEST(VariantTest, ConvertsBetweenKinds) {
   EXPECT_FALSE(Variant(u"FALSE").toBoolean());
   EXPECT_TRUE(Variant(u"-1").toBoolean());
   EXPECT_FALSE(Variant(u"0").toBoolean());
-  EXPECT_TRUE(raisesRuntime([] { (void)Variant(u"yes").toBoolean(); }, RuntimeError::kTypeMismatch));
+  EXPECT_TRUE(
+      raisesRuntime([] { (void)Variant(u"yes").toBoolean(); }, RuntimeError::kTypeMismatch));
   EXPECT_TRUE(raisesRuntime([] { (void)Variant(40000).toInteger(); }, RuntimeError::kOverflow));
-  EXPECT_TRUE(raisesRuntime([] { (void)Variant::null().toText(); }, RuntimeError::kInvalidUseOfNull));
-  EXPECT_TRUE(raisesRuntime([] { (void)Variant::missing().toLong(); }, RuntimeError::kTypeMismatch));
+  EXPECT_TRUE(
+      raisesRuntime([] { (void)Variant::null().toText(); }, RuntimeError::kInvalidUseOfNull));
+  EXPECT_TRUE(
+      raisesRuntime([] { (void)Variant::missing().toLong(); }, RuntimeError::kTypeMismatch));
   EXPECT_TRUE(raisesRuntime([] { (void)Variant(std::make_shared<clsMyErr>()).toText(); },
                             RuntimeError::kTypeMismatch));
-}
-
-TEST(VariantTest, ObjectsConvertOnlyToTheirClass) {
   auto err = std::make_shared<clsMyErr>();
   EXPECT_EQ(Variant(err).toObjectOf<clsMyErr>(), err);
   EXPECT_EQ(Variant().toObject(), nullptr);
