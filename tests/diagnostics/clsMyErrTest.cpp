@@ -42,16 +42,13 @@ TEST(clsMyErrTest, RaiseStoresTheGivenValuesOverThePreviousOnes) {
   EXPECT_EQ(err.Description(), u"nothing wrong");
 }
 
-TEST(clsMyErrTest, RaiseWithARecordStoresItsDescriptionAsTheSource) {
+TEST(clsMyErrTest, RecordsRaisedOrSetAndSetErrorInfoFromCleared) {
   clsMyErr err;
-  const ErrorRecord record = sampleRecord();
-  EXPECT_TRUE(raises([&] { err.Raise(record); }, 53, u"File not found", u"File not found"));
+  // Raised with a record, the record's description is stored as the source too.
+  EXPECT_TRUE(raises([&] { err.Raise(sampleRecord()); }, 53, u"File not found", u"File not found"));
   EXPECT_EQ(err.HelpContext(), u"1234");
   EXPECT_EQ(err.LastDllError(), 2);
-}
-
-TEST(clsMyErrTest, SetErrorAndSetErrorInfoStartFromCleared) {
-  clsMyErr err;
+  // SetErrorInfo and SetError start from a cleared error.
   err.SetErrorInfo(5, u"S", u"D", u"H", u"9");
   err.SetErrorInfo(Variant::missing(), u"Only.Source");
   EXPECT_EQ(err.Number(), 0);

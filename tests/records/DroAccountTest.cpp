@@ -66,7 +66,7 @@ TEST(DroAccountTest, MissingSublevelRaisesAfterTheHeaderWasRead) {
   EXPECT_EQ(account.IsActive(), u"true");
 }
 
-TEST(DroAccountTest, SetterLimits) {
+TEST(DroAccountTest, SetterLimitsAndTheDumpThatOpensWithFalse) {
   DroAccount account;
   account.Desc(Text(40, u'd'));
   EXPECT_EQ(account.Desc(), Text(29, u'd'));  // cut, not refused
@@ -85,9 +85,6 @@ TEST(DroAccountTest, SetterLimits) {
   account.AccountType(u" bank ");
   EXPECT_EQ(account.AccountType(), u"Bank");
   EXPECT_EQ(account.Sublevel(), u"");  // refused values leave the old one
-}
-
-TEST(DroAccountTest, DumpOpensWithFalse) {
   EXPECT_TRUE(test::matchesGolden(DroAccount().PrintOut(), "records/account_new.txt"));
 }
 

@@ -49,7 +49,7 @@ TEST(DroObjRefTest, ParseReadsChildrenFromTheCursorNotFromTheTag) {
   EXPECT_EQ(end, before);
 }
 
-TEST(DroTypedRefTest, LimitsAndTrimRulesPerKind) {
+TEST(DroTypedRefTest, LimitsTrimRulesAndRequiredPerKind) {
   DroSalesRepRef rep;
   rep.FullName(u"  ABCDE  ");
   EXPECT_EQ(rep.FullName(), u"ABCDE");
@@ -65,9 +65,6 @@ TEST(DroTypedRefTest, LimitsAndTrimRulesPerKind) {
       raisesTooLong([&] { income.FullName(Text(158, u'a') + u"  "); }, Text(158, u'a') + u"  "));
   DroSalesTaxCodeRef tax;
   EXPECT_TRUE(raisesTooLong([&] { tax.FullName(u"TAXX"); }, u"TAXX"));
-}
-
-TEST(DroTypedRefTest, OnlyTheClassReferencePassesRequiredOn) {
   const Text text = u"<ClassRef><ListID></ListID><FullName>A</FullName></ClassRef>";
   int32_t start = 1;
   int32_t end = 1;
