@@ -21,7 +21,7 @@ FAULTS = [
      'writeElementIfSet(builder, u"FirstName", cust.FirstName());\n'
      '  writeElementIfSet(builder, u"Salutation", cust.Salutation());'),
     ("value checks", "droqbxml/qbxml/basValidations.cpp",
-     "*amount > kAmountLimit) {", "*amount > kAmountLimit + 1) {"),
+     "return point <= maxDigits + (startsWithSign(text) ? 1 : 0);", "return point <= maxDigits;"),
     ("wrapper status", "droqbxml/connection/DroXmlSdkWrapper.cpp",
      "if (containsAnyUpper(upper, kEstimateTaxMessages)) {",
      "if (containsAnyUpper(upper, kInvoiceTaxMessages)) {"),
