@@ -106,6 +106,12 @@ check_install_tree() {
     -path '*/internal/*' ! -path ./records/internal/TextSearch.hpp -print)
   [ -z "$stray" ] || fail "$kind: private or non-header files under include/droqbxml: $stray"
   [ ! -e "$prefix/bin" ] || fail "$kind: a command was installed with the command line off"
+  # The umbrella header compiles in the hosts; the stand-in's headers each on their own.
+  local header
+  for header in "$prefix"/include/droqbxml-simulator/simulator/*.hpp; do
+    logged "$work/header.log" c++ -std=c++20 -fsyntax-only -I "$prefix/include" \
+      -I "$prefix/include/droqbxml-simulator" -x c++ "$header"
+  done
   if grep -rlE 'droqbxml_options|-Wall|-Werror|-fsanitize' "$prefix/lib/cmake/droqbxml" \
     "$prefix/lib/pkgconfig" || grep -rlF "$root" "$prefix/lib/cmake/droqbxml" "$prefix/lib/pkgconfig"; then
     fail "$kind: the package names build-tree paths or the project's own flags"
