@@ -9,9 +9,11 @@
 // error, "~ text" for output that need only contain the text. DROQBXML_WRITE_GOLDENS=1
 // rewrites the outputs from what the command printed.
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <cstdlib>
 #include <filesystem>
+#include <optional>
 #include <sstream>
 
 #include "cli/Cli.hpp"
@@ -117,6 +119,17 @@ std::string replaced(std::string text, const std::string& from, const std::strin
   return text;
 }
 
+// xmllint's verdict on a document, or nothing when xmllint is missing.
+std::optional<bool> wellFormed(const std::string& document) {
+  if (std::system("xmllint --version > /dev/null 2>&1") != 0) return std::nullopt;
+  const auto file = std::filesystem::temp_directory_path() /
+                    ("droqbxml-cli-" + std::to_string(::getpid()) + ".xml");
+  test::writeFile(file, document);
+  const int status = std::system(("xmllint --noout '" + file.string() + "' 2>/dev/null").c_str());
+  std::filesystem::remove(file);
+  return status == 0;
+}
+
 class CliCommandsTest : public ::testing::Test {
  protected:
   void SetUp() override {
@@ -175,6 +188,11 @@ TEST_F(CliCommandsTest, EveryCommandOfTheTable) {
       EXPECT_EQ(out, c.out);
     } else {
       for (const auto& text : c.contains) EXPECT_NE(out.find(text), std::string::npos) << text;
+    }
+    // What send and query print is a well-formed document, entities intact.
+    if (!c.command.starts_with("@cat") && result.out.find("<QBXMLMsgsRs>") != std::string::npos &&
+        wellFormed(result.out) == false) {
+      ADD_FAILURE() << "xmllint refuses the output";
     }
   }
   if (write != nullptr && *write == '1') test::writeFile(path, rewritten);
