@@ -248,6 +248,17 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
   relay->add_option("--port", port, "Loopback port to listen on")->capture_default_str();
 
   try {
+    // A first word that names no command would otherwise be reported as a missing one.
+    const auto named = [&](const char* word) {
+      for (const CLI::App* command : app.get_subcommands({})) {
+        if (command->check_name(word)) return true;
+      }
+      return false;
+    };
+    if (argc > 1 && argv[1][0] != '-' && !named(argv[1])) {
+      throw CLI::ExtrasError("unknown command '" + std::string(argv[1]) + "'",
+                             CLI::ExitCodes::ExtrasError);
+    }
     app.parse(argc, argv);
     for (const QueryOptions* q : {&query, &built}) {
       if (q->fullName && q->kind == udEtItem && !q->itemKind) {
