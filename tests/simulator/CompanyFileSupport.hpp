@@ -1,6 +1,7 @@
-// Helpers for the company-file and processor suites: a temporary folder per test, direct
-// SQL on a company file, and child processes (for crashes, concurrent writers and runs
-// without root's right to write anywhere).
+// Helpers for the stand-in's suites: a temporary folder per test, an environment variable set
+// for a test, direct SQL on a company file, child processes (for crashes, concurrent writers
+// and runs without root's right to write anywhere), xmllint's verdicts against the qbXML
+// validator schema, and lines compared with a golden file.
 #ifndef DROQBXML_TESTS_SIMULATOR_COMPANYFILESUPPORT_HPP_
 #define DROQBXML_TESTS_SIMULATOR_COMPANYFILESUPPORT_HPP_
 
@@ -12,10 +13,18 @@
 
 #include <atomic>
 #include <cstdint>
+#include <cstdlib>
 #include <filesystem>
 #include <functional>
+#include <map>
+#include <optional>
+#include <sstream>
 #include <string>
+#include <string_view>
 #include <system_error>
+#include <vector>
+
+#include "tests/TestSupport.hpp"
 
 namespace droqbxml::test {
 
@@ -45,6 +54,25 @@ class TemporaryFolder {
 
  private:
   std::filesystem::path root_;
+};
+
+// An environment variable set (or left as it is when `value` is null) for the life of the
+// object, then restored.
+class ScopedVariable {
+ public:
+  explicit ScopedVariable(const char* name, const char* value = nullptr) : name_(name) {
+    if (const char* old = std::getenv(name)) previous_ = old;
+    if (value) set(value);
+  }
+  ~ScopedVariable() { previous_ ? ::setenv(name_, previous_->c_str(), 1) : ::unsetenv(name_); }
+  ScopedVariable(const ScopedVariable&) = delete;
+  ScopedVariable& operator=(const ScopedVariable&) = delete;
+
+  void set(const char* value) const { ::setenv(name_, value, 1); }
+
+ private:
+  const char* name_;
+  std::optional<std::string> previous_;
 };
 
 // Runs statements on `db`; a failure fails the test with SQLite's message.
@@ -118,6 +146,43 @@ inline int runUnprivileged(const std::function<int()>& body) {
     }
     return body();
   }));
+}
+
+// xmllint's verdict on each of `files` (all in `folder`), keyed by its name without the
+// extension, by one run against the qbXML 13.0 validator schema; its output stays in
+// `folder`/xmllint.txt. Nothing when xmllint or the schema is not available.
+inline std::optional<std::map<std::string, bool>> xmllintVerdicts(
+    const std::vector<std::filesystem::path>& files, const std::filesystem::path& folder) {
+  const auto schema = std::filesystem::path(DROQBXML_SHARED_DIR) / "qbxml/xsd/qbxmlops130.xsd";
+  if (!std::filesystem::exists(schema) || std::system("xmllint --version >/dev/null 2>&1") != 0) {
+    return std::nullopt;
+  }
+  if (files.empty()) return std::map<std::string, bool>{};
+  std::string command =
+      "cd '" + folder.string() + "' && xmllint --noout --schema '" + schema.string() + "'";
+  for (const auto& file : files) command += " " + file.filename().string();
+  command += " > xmllint.txt 2>&1";
+  std::system(command.c_str());
+  std::map<std::string, bool> verdicts;
+  std::istringstream lines(readFile(folder / "xmllint.txt"));
+  for (std::string line; std::getline(lines, line);) {
+    for (const auto& [ending, valid] :
+         {std::pair<std::string_view, bool>{" validates", true}, {" fails to validate", false}}) {
+      if (!line.ends_with(ending)) continue;
+      verdicts[std::filesystem::path(line.substr(0, line.size() - ending.size())).stem().string()] =
+          valid;
+    }
+  }
+  return verdicts;
+}
+
+// Compares `lines`, each ended by a line feed, with the golden file
+// tests/testdata/simulator/`name`.
+inline ::testing::AssertionResult linesMatchGolden(const std::vector<std::string>& lines,
+                                                   const std::string& name) {
+  std::string text;
+  for (const std::string& line : lines) text += line + "\n";
+  return matchesGolden(fromUtf8(text), "simulator/" + name);
 }
 
 }  // namespace droqbxml::test

@@ -5,12 +5,8 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
-#include <cstdio>
-#include <cstdlib>
 #include <filesystem>
 #include <map>
-#include <optional>
-#include <sstream>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -28,9 +24,6 @@ namespace {
 using internal::Particle;
 using internal::ParticleKind;
 using internal::ValueType;
-
-const std::filesystem::path kSchema =
-    std::filesystem::path(DROQBXML_SHARED_DIR) / "qbxml/xsd/qbxmlops130.xsd";
 
 // An element of a generated request: a value or children, and its leaf rule when a leaf.
 struct Node {
@@ -198,29 +191,6 @@ bool schemaProblem(const Problem& problem) {
   return !problem.message.starts_with("QuickBooks Desktop refuses");
 }
 
-// xmllint's verdict on each file, by one run over all of them; empty when it cannot run.
-std::map<std::string, bool> xmllintVerdicts(const std::vector<std::filesystem::path>& files,
-                                            const std::filesystem::path& folder) {
-  if (!std::filesystem::exists(kSchema) || std::system("xmllint --version >/dev/null 2>&1") != 0) {
-    return {};
-  }
-  std::string command =
-      "cd '" + folder.string() + "' && xmllint --noout --schema '" + kSchema.string() + "'";
-  for (const auto& file : files) command += " " + file.filename().string();
-  command += " > verdicts.txt 2>&1";
-  std::system(command.c_str());
-  std::map<std::string, bool> verdicts;
-  std::istringstream lines(test::readFile(folder / "verdicts.txt"));
-  for (std::string line; std::getline(lines, line);) {
-    const std::size_t at = line.find(".xml ");
-    if (at == std::string::npos) continue;
-    const std::string rest = line.substr(at + 5);
-    if (rest == "validates") verdicts[line.substr(0, at)] = true;
-    if (rest == "fails to validate") verdicts[line.substr(0, at)] = false;
-  }
-  return verdicts;
-}
-
 TEST(EveryRequestTypeTest, ReaderAgreesWithTheValidatorSchema) {
   const test::TemporaryFolder folder;
   std::vector<Sample> samples;
@@ -233,7 +203,8 @@ TEST(EveryRequestTypeTest, ReaderAgreesWithTheValidatorSchema) {
     files.push_back(folder / (sample.name + ".xml"));
     test::writeFile(files.back(), sample.document);
   }
-  const std::map<std::string, bool> verdicts = xmllintVerdicts(files, folder.root());
+  const std::map<std::string, bool> verdicts =
+      test::xmllintVerdicts(files, folder.root()).value_or(std::map<std::string, bool>{});
   int compared = 0;
   int refused = 0;
   for (const Sample& sample : samples) {

@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
-#include <cstdlib>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -12,6 +11,7 @@
 #include "simulator/handlers/Clock.hpp"
 #include "simulator/handlers/Fields.hpp"
 #include "simulator/handlers/Values.hpp"
+#include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml::simulator::handlers {
 namespace {
@@ -94,25 +94,8 @@ TEST(RequestHandlersValuesTest, TextKeepsIso88591AndReplacesTheRest) {
   EXPECT_EQ(booleanText("0"), "false");
 }
 
-class RequestHandlersClockTest : public ::testing::Test {
- protected:
-  void SetUp() override {
-    if (const char* old = std::getenv("DROQBXML_SIMULATOR_NOW")) previous_ = old;
-  }
-  void TearDown() override {
-    if (previous_) {
-      ::setenv("DROQBXML_SIMULATOR_NOW", previous_->c_str(), 1);
-    } else {
-      ::unsetenv("DROQBXML_SIMULATOR_NOW");
-    }
-  }
-
- private:
-  std::optional<std::string> previous_;
-};
-
-TEST_F(RequestHandlersClockTest, AFixedPresentSetsTheTimeAndTheLocalOffset) {
-  ::setenv("DROQBXML_SIMULATOR_NOW", "2009-03-02T10:40:23-05:00", 1);
+TEST(RequestHandlersClockTest, AFixedPresentSetsTheTimeAndTheLocalOffset) {
+  const test::ScopedVariable now("DROQBXML_SIMULATOR_NOW", "2009-03-02T10:40:23-05:00");
   EXPECT_EQ(currentTime(), 1236008423);
   EXPECT_EQ(formatDateTime(currentTime()), "2009-03-02T10:40:23-05:00");
   EXPECT_EQ(formatDateTime(1236008423 - 11 * 3600), "2009-03-01T23:40:23-05:00");
@@ -127,10 +110,10 @@ TEST_F(RequestHandlersClockTest, AFixedPresentSetsTheTimeAndTheLocalOffset) {
     EXPECT_EQ(parseDateTime(wrong, false), std::nullopt) << wrong;
   }
 
-  ::setenv("DROQBXML_SIMULATOR_NOW", "2024-07-01T09:30:00+05:30", 1);
+  now.set("2024-07-01T09:30:00+05:30");
   EXPECT_EQ(formatDateTime(currentTime()), "2024-07-01T09:30:00+05:30");
   // Not a full date and time: the real clock and time zone are used.
-  ::setenv("DROQBXML_SIMULATOR_NOW", "2024-07-01", 1);
+  now.set("2024-07-01");
   EXPECT_GT(currentTime(), 1700000000);
 }
 

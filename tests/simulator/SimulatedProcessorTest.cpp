@@ -4,10 +4,8 @@
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 
-#include <cstdlib>
 #include <functional>
 #include <memory>
-#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -79,7 +77,8 @@ class SimulatedProcessorTest : public ::testing::Test {
  protected:
   void SetUp() override {
     CompanyFile::create(folder_ / "a.qbw", {"Company A", true, {"Tessaly", "First", "Second"}});
-    CompanyFile::create(folder_ / "b.qbw", {"Company B", false, {"Tessaly", "First", "Second", "Refused"}});
+    CompanyFile::create(folder_ / "b.qbw",
+                        {"Company B", false, {"Tessaly", "First", "Second", "Refused"}});
   }
   Text file(const std::string& name) const { return textOf(folder_ / name); }
   // A processor whose connection is open for the application `appName`.
@@ -264,17 +263,12 @@ TEST_F(SimulatedProcessorTest, RequestsAreCheckedThenAnsweredFromTheCompanyFile)
 struct RegistrationGuard {
   RequestProcessorFactory processor = registeredRequestProcessor(kRequestProcessorProgId);
   RequestProcessorFactory simulator = registeredRequestProcessor(kSimulatorProgId);
-  std::optional<std::string> choice = [] {
-    const char* value = std::getenv("DROQBXML_REQUEST_PROCESSOR");
-    return value ? std::optional<std::string>(value) : std::nullopt;
-  }();
+  test::ScopedVariable choice{"DROQBXML_REQUEST_PROCESSOR"};
   ~RegistrationGuard() {
     for (const auto& [progId, factory] :
          {std::pair{kRequestProcessorProgId, processor}, std::pair{kSimulatorProgId, simulator}}) {
       factory ? registerRequestProcessor(progId, factory) : unregisterRequestProcessor(progId);
     }
-    choice ? ::setenv("DROQBXML_REQUEST_PROCESSOR", choice->c_str(), 1)
-           : ::unsetenv("DROQBXML_REQUEST_PROCESSOR");
   }
 };
 
@@ -286,11 +280,11 @@ TEST_F(SimulatedProcessorTest, InstallationTakesQuickBooksPlaceOnlyWhenAsked) {
   const RegistrationGuard guard;
   unregisterRequestProcessor(kRequestProcessorProgId);
   unregisterRequestProcessor(kSimulatorProgId);
-  ::setenv("DROQBXML_REQUEST_PROCESSOR", "quickbooks", 1);
+  guard.choice.set("quickbooks");
   EXPECT_FALSE(installIfRequested());
   EXPECT_TRUE(isSimulated(createRequestProcessor(kSimulatorProgId)));
   EXPECT_FALSE(registeredRequestProcessor(kRequestProcessorProgId));
-  ::setenv("DROQBXML_REQUEST_PROCESSOR", "simulator", 1);
+  guard.choice.set("simulator");
   EXPECT_TRUE(installIfRequested());
   EXPECT_TRUE(isSimulated(createRequestProcessor(kRequestProcessorProgId)));
 
