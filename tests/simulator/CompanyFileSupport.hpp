@@ -148,8 +148,8 @@ inline int runUnprivileged(const std::function<int()>& body) {
   }));
 }
 
-// xmllint's verdict on each of `files` (all in `folder`), keyed by its name without the
-// extension, by one run against the qbXML 13.0 validator schema; its output stays in
+// xmllint's verdict on each of `files` (all in one folder), keyed by its name without the
+// extension, by one run against the qbXML 13.0 validator schema; its output is left in
 // `folder`/xmllint.txt. Nothing when xmllint or the schema is not available.
 inline std::optional<std::map<std::string, bool>> xmllintVerdicts(
     const std::vector<std::filesystem::path>& files, const std::filesystem::path& folder) {
@@ -158,10 +158,10 @@ inline std::optional<std::map<std::string, bool>> xmllintVerdicts(
     return std::nullopt;
   }
   if (files.empty()) return std::map<std::string, bool>{};
-  std::string command =
-      "cd '" + folder.string() + "' && xmllint --noout --schema '" + schema.string() + "'";
+  std::string command = "cd '" + files.front().parent_path().string() +
+                        "' && xmllint --noout --schema '" + schema.string() + "'";
   for (const auto& file : files) command += " " + file.filename().string();
-  command += " > xmllint.txt 2>&1";
+  command += " > '" + (folder / "xmllint.txt").string() + "' 2>&1";
   std::system(command.c_str());
   std::map<std::string, bool> verdicts;
   std::istringstream lines(readFile(folder / "xmllint.txt"));
