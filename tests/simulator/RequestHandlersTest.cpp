@@ -90,6 +90,17 @@ std::string rq(std::string_view compact) {
   return out;
 }
 
+// The compact requests of the file tests/testdata/simulator/`name`, its lines joined and those
+// starting with "//" left out.
+std::string rqFile(const std::string& name) {
+  std::istringstream lines(test::readFile(kTestData / "simulator" / name));
+  std::string compact;
+  for (std::string line; std::getline(lines, line);) {
+    if (!line.starts_with("//")) compact += line;
+  }
+  return rq(compact);
+}
+
 class RequestHandlersTest : public ::testing::Test {
  protected:
   // Every 13.0 response the test received must be valid against the qbXML schema.
@@ -276,26 +287,7 @@ TEST_F(RequestHandlersTest, NewCompanyHoldsChartOfAccountsTaxCodesAndSalesTaxIte
 // reported); the invoice whose second line failed is rolled back whole.
 TEST_F(RequestHandlersTest, RefusedAddsGetQuickBooksStatusCodeAndMessage) {
   answer(kAcmeAndItems);
-  const std::string response = answer(
-      rq("CustomerAdd{Name=Bolt;CreditLimit=246.9};InvoiceAdd{CustomerRef=Nobody;InvoiceLineAdd{"
-         "ItemRef=Labor;Amount=10.001}};EstimateAdd{CustomerRef=Acme;EstimateLineAdd{"
-         "ItemRef=Labor;Quantity=1.123456}};ItemServiceAdd{Name=Travel;SalesOrPurchase{"
-         "Price=1.000001}};ItemDiscountAdd{Name=Promo;DiscountRatePercent=10.000001};"
-         "CustomerQuery{FullName=Bolt};"
-         // Items of every kind share one name list.
-         "CustomerAdd{Name=ACME};CustomerAdd{Name=Job;ParentRef=Acme};CustomerAdd{Name=job;"
-         "ParentRef=acme};AccountAdd{Name=sales;AccountType=Income};ItemServiceAdd{"
-         "Name=State tax;SalesOrPurchase{Price=1}};CustomerAdd{Name=" +
-         std::string(42, 'x') + "};CustomerAdd{Name=" + std::string(41, 'x') +
-         "};InvoiceAdd{CustomerRef=Zenith};EstimateAdd{CustomerRef{ListID=80000009-1236008423};"
-         "EstimateLineAdd{Desc=Survey}};InvoiceAdd{CustomerRef=Acme;InvoiceLineAdd{ItemRef=Labor};"
-         "InvoiceLineAdd{ItemRef=Plaster}};EstimateAdd{CustomerRef=Acme;EstimateLineGroupAdd{"
-         "ItemGroupRef=Labor}};InvoiceAdd{CustomerRef=Acme;InvoiceLineAdd{ItemRef=Kitchen Kit}};"
-         "InvoiceAdd{CustomerRef=Acme;InvoiceLineAdd{ItemRef=Labor;SalesTaxCodeRef=Exempt}};"
-         "CustomerAdd{Name=Bath;ParentRef=Nobody};CustomerAdd{Name=Bath;TermsRef=Net 30};"
-         "ItemInventoryAdd{Name=Tile;IncomeAccountRef=Revenue};ItemGroupAdd{Name=Bath Kit;"
-         "ItemGroupLine{ItemRef=Kitchen Kit}};InvoiceQuery{}"),
-      "continueOnError");
+  const std::string response = answer(rqFile("refused_adds.rq"), "continueOnError");
   EXPECT_TRUE(test::linesMatchGolden(statuses(response), "refused_adds_statuses.txt"));
   // A refused request leaves no element behind it: no content, self-closing.
   EXPECT_NE(response.find("statusMessage=\"There was an error when converting the amount "
@@ -700,45 +692,7 @@ TEST_F(RequestHandlersTest, RecordsHaveTheShapeOfQuickBooksOwnResponses) {
 // asks for each kind of response, with as many fields as the stand-in keeps.
 TEST_F(RequestHandlersTest, EveryResponseKindValidatesAgainstTheQbxmlSchema) {
   if (!test::xmllintVerdicts({}, folder_.root())) GTEST_SKIP() << "no xmllint or qbXML schema";
-  std::string queries;
-  for (const char* kind : {"Account", "Item", "ItemService", "ItemNonInventory", "ItemOtherCharge",
-                           "ItemInventory", "ItemDiscount", "ItemSubtotal", "ItemGroup",
-                           "ItemPayment", "ItemSalesTax", "ItemSalesTaxGroup", "PayrollItemWage"}) {
-    queries += std::string(kind) + "Query{};";
-  }
-  const std::string response = answer(
-      kItems +
-          rq("CustomerAdd#1{Name=Acme;IsActive=true;CompanyName=Acme Inc;Salutation=Ms;"
-             "FirstName=Ann;LastName=Lee;BillAddress{Addr1=1 Main St;City=Springfield;State=IL;"
-             "PostalCode=62701;Country=USA;Note=Rear};ShipAddress{Addr1=Dock 4};Phone=555-0100;"
-             "Fax=555-0101;Email=ann@example.com;Contact=Ann Lee;OpenBalance=10.00;"
-             "OpenBalanceDate=2009-01-01;ResaleNumber=R-1;AccountNumber=A-1;CreditLimit=500.00;"
-             "JobStatus=Awarded;JobStartDate=2009-03-01;JobDesc=Renovation;Notes=Call first};"
-             "CustomerAdd{Name=Kitchen;ParentRef=Acme};AccountAdd{Name=Checking;AccountType=Bank;"
-             "AccountNumber=1000;Desc=Main account;OpenBalance=250.00};AccountAdd{Name=Payroll;"
-             "ParentRef=Checking;AccountType=Bank};ItemOtherChargeAdd{Name=Freight;"
-             "SalesAndPurchase{SalesDesc=Freight;SalesPrice=12.5;IncomeAccountRef=Sales;"
-             "PurchaseDesc=Carrier;PurchaseCost=10;ExpenseAccountRef=Job Expenses}};"
-             "ItemInventoryAdd{Name=Tile;SalesDesc=Tile, box;SalesPrice=40;IncomeAccountRef=Sales;"
-             "PurchaseCost=25;COGSAccountRef=Cost of Goods Sold;AssetAccountRef=Inventory Asset;"
-             "ReorderPoint=5;QuantityOnHand=12;TotalValue=300.00;InventoryDate=2009-01-01};"
-             "ItemDiscountAdd{Name=Loyalty;ItemDesc=Loyalty discount;DiscountRatePercent=10;"
-             "AccountRef=Sales};ItemPaymentAdd{Name=Deposit;ItemDesc=Deposit received;"
-             "DepositToAccountRef=Undeposited Funds};ItemSalesTaxAdd{Name=County;"
-             "ItemDesc=County tax;TaxRate=1.25};ItemSalesTaxGroupAdd{Name=Combined;"
-             "ItemSalesTaxRef=State Tax;ItemSalesTaxRef=County};EstimateAdd{"
-             "CustomerRef=Acme:Kitchen;TxnDate=2009-03-02;PONumber=PO-7;Memo=First estimate;"
-             "EstimateLineGroupAdd{ItemGroupRef=Kitchen Kit};EstimateLineAdd{ItemRef=Loyalty};"
-             "EstimateLineAdd{ItemRef=Tile;Quantity=2;MarkupRatePercent=15}};InvoiceAdd{"
-             "CustomerRef=Acme;IsPending=false;PONumber=PO-8;FOB=Works;ItemSalesTaxRef=Combined;"
-             "Memo=First invoice;InvoiceLineGroupAdd{ItemGroupRef=Kitchen Kit;Quantity=2;"
-             "ServiceDate=2009-03-01};InvoiceLineAdd{ItemRef=Freight;ServiceDate=2009-03-02};"
-             "InvoiceLineAdd{ItemRef=Subtotal};InvoiceLineAdd{ItemRef=Deposit;Amount=-50.00}};"
-             "CustomerQuery{ActiveStatus=All};CustomerQuery{FullName=Nobody;FullName=Acme};" +
-             queries +
-             "EstimateQuery{IncludeLineItems=true};InvoiceQuery{IncludeLineItems=true};"
-             "InvoiceAdd{CustomerRef=Nobody}"),
-      "continueOnError");
+  const std::string response = answer(kItems + rqFile("every_response_kind.rq"), "continueOnError");
   std::set<std::string> kinds;
   for (const std::string& status : statuses(response)) {
     kinds.insert(status.substr(0, status.find(' ')));
