@@ -15,6 +15,7 @@ namespace droqbxml {
 namespace {
 
 constexpr TextView kFakeProgId = u"Test.FakeProcessor";
+const std::filesystem::path kData = std::filesystem::path(DROQBXML_TESTDATA_DIR) / "cli";
 
 using Result = test::CliResult;
 
@@ -45,18 +46,11 @@ class CliTest : public ::testing::Test {
 };
 
 TEST_F(CliTest, PrintsTheResponseAsReturnedAndSummarisesEachStatus) {
-  fake_->process = [](const Text&) {
-    return Text(
-        u"<QBXML><QBXMLMsgsRs><InvoiceQueryRs requestID=\"7\" statusCode=\"0\" "
-        u"statusSeverity=\"Info\" statusMessage=\"Status OK\" retCount=\"1\"><InvoiceRet>"
-        u"<TxnID>1-2</TxnID><CustomerRef><FullName>A &amp; B</FullName></CustomerRef>"
-        u"<InvoiceLineRet><Desc>a</Desc></InvoiceLineRet><InvoiceLineRet><Desc>b</Desc>"
-        u"</InvoiceLineRet></InvoiceRet></InvoiceQueryRs><X statusCode=\"1\" "
-        u"statusSeverity=\"Info\" statusMessage=\"none\"/></QBXMLMsgsRs></QBXML>");
-  };
+  const std::string response = test::readFile(kData / "invoice_query_rs.xml");
+  fake_->process = [&](const Text&) { return fromUtf8(response); };
   const Result xml = send({}, "\xEF\xBB\xBF<request/>");
   EXPECT_EQ(xml.code, cli::kExitSuccess) << xml.err;
-  EXPECT_EQ(xml.out, toUtf8(fake_->process(u"")));
+  EXPECT_EQ(xml.out, response);
   EXPECT_EQ(xml.err,
             "InvoiceQueryRs requestID=7 statusCode=0 statusSeverity=Info statusMessage=Status OK\n"
             "X statusCode=1 statusSeverity=Info statusMessage=none\n");
@@ -65,18 +59,7 @@ TEST_F(CliTest, PrintsTheResponseAsReturnedAndSummarisesEachStatus) {
                                       "BeginSession(C:\\co.qbw,2)", "ProcessRequest(ticket-1)",
                                       "EndSession(ticket-1)", "CloseConnection"}));
   // Repeated elements become arrays; values stay text.
-  EXPECT_EQ(send({"--format", "JSON"}).out,
-            "[\n  {\n    \"response\": \"InvoiceQueryRs\",\n    \"requestID\": \"7\",\n"
-            "    \"statusCode\": \"0\",\n    \"statusSeverity\": \"Info\",\n"
-            "    \"statusMessage\": \"Status OK\",\n    \"retCount\": \"1\",\n"
-            "    \"records\": [\n      {\n        \"InvoiceRet\": {\n"
-            "          \"TxnID\": \"1-2\",\n          \"CustomerRef\": {\n"
-            "            \"FullName\": \"A & B\"\n          },\n"
-            "          \"InvoiceLineRet\": [\n            {\n              \"Desc\": \"a\"\n"
-            "            },\n            {\n              \"Desc\": \"b\"\n            }\n"
-            "          ]\n        }\n      }\n    ]\n  },\n  {\n    \"response\": \"X\",\n"
-            "    \"statusCode\": \"1\",\n    \"statusSeverity\": \"Info\",\n"
-            "    \"statusMessage\": \"none\",\n    \"records\": []\n  }\n]\n");
+  EXPECT_EQ(send({"--format", "JSON"}).out, test::readFile(kData / "invoice_query_rs.json"));
 
   // Any response that is not Info makes the exit code 1, wherever it stands.
   fake_->process = [](const Text&) {
