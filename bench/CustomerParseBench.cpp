@@ -52,5 +52,26 @@ BENCHMARK(BM_CustomerFirstParse)
     ->Iterations(15)
     ->Unit(benchmark::kMillisecond);
 
+// The converters on the same ASCII-heavy text: UTF-8 to the component's UTF-16 text, and
+// back, each against pugixml's whole parse of the UTF-8 text.
+void BM_FromUtf8(benchmark::State& state) {
+  const std::string response = batchResponse(static_cast<int>(state.range(0)));
+  bench::againstPugixml(state, response, [&](Text&) {
+    const Text text = fromUtf8(response);
+    return text.size() == response.size();
+  });
+}
+
+void BM_ToUtf8(benchmark::State& state) {
+  const std::string response = batchResponse(static_cast<int>(state.range(0)));
+  bench::againstPugixml(state, response, [&](Text& fresh) {
+    const std::string bytes = toUtf8(fresh);
+    return bytes.size() == response.size();
+  });
+}
+
+BENCHMARK(BM_FromUtf8)->Arg(10000)->UseManualTime()->Iterations(15)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ToUtf8)->Arg(10000)->UseManualTime()->Iterations(15)->Unit(benchmark::kMillisecond);
+
 }  // namespace
 }  // namespace droqbxml

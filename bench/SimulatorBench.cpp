@@ -28,7 +28,7 @@ class Company {
                 ("droqbxml-bench-" + std::to_string(::getpid()) + "-" + name)) {
     fs::remove_all(folder_);
     fs::create_directories(folder_);
-    simulator::CompanyFile::create(path(), {"Bench Company", true});
+    simulator::CompanyFile::create(path(), {"Bench Company", true, {"Bench"}});
     processor_ = simulator::createProcessor();
     processor_->OpenConnection(u"", u"Bench");
     ticket_ = processor_->BeginSession(fromUtf8(path().string()), qbFileOpenDoNotCare);
