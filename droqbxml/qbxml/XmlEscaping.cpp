@@ -9,6 +9,7 @@
 // when such a character appears.
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 
+#include <cstdint>
 #include <string>
 
 #include "droqbxml/component/basGlobals.hpp"
@@ -21,36 +22,64 @@ namespace {
 
 bool isDigit(char16_t c) { return c >= u'0' && c <= u'9'; }
 
-void appendEscaped(Text& out, char16_t c, bool useUnicode) {
-  const int32_t code = useUnicode ? static_cast<int32_t>(c) : ansiCode(c);
-  // A character the code page lacks has the code of "?", a printable code: it is written
-  // as it is, not as "?" or as a reference.
-  if (code >= 32 && code <= 126) {
-    switch (c) {
-      case u'\'':
-        out += u"&apos;";
-        return;
-      case u'"':
-        out += u"&quot;";
-        return;
-      case u'<':
-        out += u"&lt;";
-        return;
-      case u'>':
-        out += u"&gt;";
-        return;
-      case u'&':
-        out += u"&amp;";
-        return;
-      default:
-        out.push_back(c);
-        return;
-    }
+// The entity of one of the five characters that have one, or an empty view.
+std::u16string_view entityOf(char16_t c) {
+  switch (c) {
+    case u'\'':
+      return u"&apos;";
+    case u'"':
+      return u"&quot;";
+    case u'<':
+      return u"&lt;";
+    case u'>':
+      return u"&gt;";
+    case u'&':
+      return u"&amp;";
+    default:
+      return {};
   }
-  out += u"&#";
-  const std::string digits = std::to_string(code);
-  out.append(digits.begin(), digits.end());
-  out.push_back(u';');
+}
+
+int32_t codeOf(char16_t c, bool useUnicode) {
+  return useUnicode ? static_cast<int32_t>(c) : ansiCode(c);
+}
+
+// A character the code page lacks has the code of "?", a printable code: it is written as
+// it is, not as "?" or as a reference.
+bool writtenAsItIs(int32_t code) { return code >= 32 && code <= 126; }
+
+size_t decimalDigits(uint32_t value) {
+  size_t count = 1;
+  while (value >= 10) value /= 10, ++count;
+  return count;
+}
+
+// Writes the character as it is, as its entity, or as "&#code;"; returns the end.
+char16_t* writeEscaped(char16_t* out, char16_t c, bool useUnicode) {
+  const int32_t code = codeOf(c, useUnicode);
+  if (writtenAsItIs(code)) {
+    const auto entity = entityOf(c);
+    if (entity.empty()) {
+      *out++ = c;
+      return out;
+    }
+    return std::char_traits<char16_t>::copy(out, entity.data(), entity.size()) + entity.size();
+  }
+  *out++ = u'&';
+  *out++ = u'#';
+  const auto value = static_cast<uint32_t>(code);
+  const size_t digits = decimalDigits(value);
+  for (size_t k = digits, rest = value; k > 0; --k, rest /= 10) {
+    out[k - 1] = static_cast<char16_t>(u'0' + rest % 10);
+  }
+  out += digits;
+  *out++ = u';';
+  return out;
+}
+
+// Printable ASCII other than the five characters that have entities: written as it is.
+bool isPlain(char16_t c) {
+  return c >= 0x20 && c <= 0x7E && c != u'\'' && c != u'"' && c != u'<' && c != u'>' && c != u'&';
 }
 
 Text replaceAll(const Text& text, TextView what, TextView with) {
@@ -128,15 +157,33 @@ bool unescapeReferencesInOnePass(const Text& text, bool useUnicode, Text& out) {
 
 Text XMLEscapeChar(TextView c, bool useUnicode) {
   if (c.empty()) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
-  Text out;
-  appendEscaped(out, c[0], useUnicode);
-  return out;
+  char16_t escaped[8];
+  return Text(escaped, writeEscaped(escaped, c[0], useUnicode));
 }
 
 Text XMLEscapeString(TextView s, bool useUnicode) {
-  Text out;
-  out.reserve(s.size() + s.size() / 8);
-  for (char16_t c : s) appendEscaped(out, c, useUnicode);
+  // One pass writing through a pointer into room made ahead (a character takes at most
+  // kLongestEscape units); the room grows when the rest might not fit.
+  constexpr size_t kLongestEscape = 8;  // "&#65535;"
+  const size_t n = s.size();
+  Text out(n + n / 4 + kLongestEscape, u'\0');
+  char16_t* dst = out.data();
+  char16_t* end = dst + out.size();
+  for (size_t i = 0; i < n; ++i) {
+    if (static_cast<size_t>(end - dst) < kLongestEscape) {
+      const size_t written = static_cast<size_t>(dst - out.data());
+      out.resize(out.size() + (n - i) + (n - i) / 4 + kLongestEscape);
+      dst = out.data() + written;
+      end = out.data() + out.size();
+    }
+    const char16_t c = s[i];
+    if (isPlain(c)) {
+      *dst++ = c;
+    } else {
+      dst = writeEscaped(dst, c, useUnicode);
+    }
+  }
+  out.resize(static_cast<size_t>(dst - out.data()));
   return out;
 }
 

@@ -47,6 +47,17 @@ std::string toUtf8(TextView text) {
   const size_t n = text.size();
   size_t bytes = 0;
   for (size_t i = 0; i < n; ++i) {
+#if defined(__SSE2__)
+    if (i + 8 <= n) {
+      const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + i));
+      const __m128i above = _mm_and_si128(units, _mm_set1_epi16(static_cast<int16_t>(0xFF80)));
+      if (_mm_movemask_epi8(_mm_cmpeq_epi16(above, _mm_setzero_si128())) == 0xFFFF) {
+        bytes += 8;
+        i += 7;
+        continue;
+      }
+    }
+#endif
     const char16_t c = in[i];
     if (c < 0x80) {
       bytes += 1;
