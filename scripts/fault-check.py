@@ -5,6 +5,7 @@ Works in a scratch copy of the committed tree (a git worktree), so the checkout 
 is: for every fault it changes one place in the source, rebuilds the ordinary test build
 and runs the tests; a fault is caught when some test fails. Prints a line per fault and
 exits 1 when any fault goes unnoticed. `make fault-check` runs it; it takes some minutes.
+An argument names another revision to check instead of HEAD (for a before-and-after).
 """
 import os
 import subprocess
@@ -51,7 +52,9 @@ def main():
     root = subprocess.check_output(["git", "rev-parse", "--show-toplevel"], text=True).strip()
     scratch = tempfile.mkdtemp(prefix="droqbxml-faults-")
     tree = os.path.join(scratch, "tree")
-    subprocess.check_call(["git", "worktree", "add", "--detach", "-q", tree, "HEAD"], cwd=root)
+    revision = sys.argv[1] if len(sys.argv) > 1 else "HEAD"
+    subprocess.check_call(["git", "worktree", "add", "--detach", "-q", tree, revision], cwd=root)
+    # The faults as listed here, whatever the revision checked.
     # The tests read ../shared beside the tree.
     os.symlink(os.path.join(os.path.dirname(root), "shared"), os.path.join(scratch, "shared"))
     build = os.path.join(tree, "build", "ordinary")
