@@ -15,7 +15,7 @@ import tempfile
 # area, file, text as committed, text with the fault
 FAULTS = [
     ("escaping", "droqbxml/qbxml/XmlEscaping.cpp",
-     'out += u"&apos;";', 'out += u"\'";'),
+     'u"&apos;";', 'u"&apo;";'),
     ("builder order", "droqbxml/qbxml/DroXmlBuilder_customers.cpp",
      'writeElementIfSet(builder, u"Salutation", cust.Salutation());\n'
      '  writeElementIfSet(builder, u"FirstName", cust.FirstName());',
