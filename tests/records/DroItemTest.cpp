@@ -1,6 +1,6 @@
 // The item records: the real inventory add response, each kind's own reading rules (the
-// sales sides, group lines, sales tax group members), setter rules, the items collection,
-// and every dump's heading and irregular first line, pinned by golden files.
+// sales sides, group lines, sales tax group members) and every dump's heading and irregular first
+// line, pinned by golden files.
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
@@ -137,31 +137,6 @@ TEST(DroItemTest, SalesTaxGroupMembersReadFromTheGroupsStart) {
   EXPECT_TRUE(test::raisesRuntime([&] { group.ParseRs(response); }, RuntimeError::kTypeMismatch));
 }
 
-TEST(DroItemTest, SetterRules) {
-  DroItemDiscount discount;
-  discount.DiscountRatePercent(u" 10.0 ");
-  EXPECT_EQ(discount.DiscountRatePercent(), u"10");
-  discount.ItemDesc(u" kept ");
-  EXPECT_EQ(discount.ItemDesc(), u" kept ");
-  DroItemInventory inventory;
-  inventory.Name(u" Tile ");  // the one kind whose name is not trimmed
-  EXPECT_EQ(inventory.Name(), u" Tile ");
-  DroItemService service;
-  service.Name(u" Tile ");
-  EXPECT_EQ(service.Name(), u"Tile");
-  service.ItemType(udItemGroup);  // free for the host to change
-  EXPECT_EQ(service.ItemType(), udItemGroup);
-  DroItemPayrollItemWage wage;
-  wage.WageType(u" hourly ");
-  EXPECT_EQ(wage.WageType(), u"Hourly");
-  EXPECT_TRUE(test::raisesRefusal([&] { wage.WageType(u"Weekly"); }, TYPE_WAGE, u"CheckWageType",
-                                  u"Weekly", u"Wage Type"));
-  DroSalesOrPurchase side;
-  EXPECT_TRUE(side.IsEmpty());
-  side.AccountRef()->FullName(u"Sales");
-  EXPECT_FALSE(side.IsEmpty());
-}
-
 TEST(DroItemTest, FreshDumps) {
   const struct {
     const char16_t* progId;
@@ -185,28 +160,6 @@ TEST(DroItemTest, FreshDumps) {
     const auto record = CreateObject(Text(u"DroQbXml.") + c.progId);
     EXPECT_TRUE(test::matchesGolden(record->get(u"PrintOut").toText(), c.golden)) << c.golden;
   }
-}
-
-TEST(DroItemsColTest, AddsOnlySixKinds) {
-  DroItemsCol items;
-  const auto tax = items.Add(Variant(7));
-  EXPECT_EQ(tax->className(), u"DroItemSalesTax");
-  EXPECT_EQ(items.Add(Variant(u"ItemSalesTax"), u"T")->get(u"ItemType").toLong(), 7);
-  EXPECT_EQ(items.Add(Variant(u" 2 "))->className(), u"DroItemInventory");
-  for (const Variant& kind : {Variant(3), Variant(u"ItemGroup"), Variant(u"itemservice"),
-                              Variant(10), Variant(u"ItemPayment")}) {
-    EXPECT_EQ(items.Add(kind), nullptr);
-  }
-  EXPECT_EQ(items.Count(), 3);
-  EXPECT_TRUE(
-      test::raisesRuntime([&] { items.Add(Variant(0), u"t"); }, RuntimeError::kDuplicateKey));
-  EXPECT_EQ(items.Count(), 3);
-  EXPECT_EQ(items.Item(Variant(1)), tax);
-  // By name, Add returns nothing for an unsupported kind.
-  const auto col = CreateObject(u"DroQbXml.DroItemsCol");
-  EXPECT_TRUE(col->call(u"Add", {Variant(3)}).toObject() == nullptr);
-  EXPECT_EQ(col->call(u"Add", {Variant(9), Variant(u"S")}).toObject()->className(),
-            u"DroItemService");
 }
 
 }  // namespace

@@ -1,6 +1,6 @@
 // Estimates and invoices read from add responses: finding the own response, the keyed line
 // and group loops with their long-standing quirks (merging, the never-cleared description
-// mark, unbounded searches, swallowed errors), group emptiness and the dumps.
+// mark, unbounded searches, swallowed errors) and the dumps.
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
@@ -194,21 +194,6 @@ TEST(TransactionTest, CutResponsesEndInAnAnswerOrAnError) {
     } catch (const ComError&) {
     }
   }
-}
-
-TEST(TransactionTest, GroupEmptinessIsWorkedOutOnEveryCall) {
-  DroEstimateLineGroup estimateGroup;
-  EXPECT_TRUE(estimateGroup.IsEmpty().toBoolean());
-  estimateGroup.TotalAmount(u"1");
-  EXPECT_FALSE(estimateGroup.IsEmpty().toBoolean());
-  estimateGroup.TotalAmount(u"");
-  estimateGroup.EstimateLines()->Add();
-  EXPECT_FALSE(estimateGroup.IsEmpty().toBoolean());
-  DroInvoiceLineGroup invoiceGroup;
-  invoiceGroup.ServiceDate(u"2026-11-25");
-  EXPECT_FALSE(invoiceGroup.IsEmpty().toBoolean());
-  EXPECT_EQ(CreateObject(u"DroQbXml.DroInvoiceLineGroup")->get(u"IsEmpty").kind(),
-            Variant::Kind::Boolean);
 }
 
 TEST(TransactionTest, Dumps) {
