@@ -40,34 +40,14 @@ std::string requestLine(const DroXmlBuilder& builder) {
   return line.substr(line.find_first_not_of('\t'));
 }
 
-// The frame, and OnError: only the two exact alternatives (trimmed of blanks) are kept.
-TEST(DroXmlBuilderTest, FrameAndOnError) {
+// The frame, with stopOnError by default and with rollbackOnError (OnError's alternatives:
+// in testdata/checks/element_and_builder_rules.txt).
+TEST(DroXmlBuilderTest, Frame) {
   DroXmlBuilder builder;
-  EXPECT_EQ(builder.XML(), u"");
-  EXPECT_EQ(builder.RequestID(), 1);
-  EXPECT_EQ(builder.OnError(), u"stopOnError");
   builder.AddHeaders();
   builder.AddFooters();
   EXPECT_EQ(xml(builder), golden("frame.xml"));
-
-  const struct {
-    const char16_t* given;
-    const char16_t* stored;
-  } cases[] = {
-      {u"continueOnError", u"continueOnError"},
-      {u"RollbackOnError", u"stopOnError"},
-      {u"abc", u"stopOnError"},
-      {u"", u"stopOnError"},
-      {u"\tcontinueOnError", u"stopOnError"},
-      {u" rollbackOnError ", u"rollbackOnError"},
-  };
-  for (const auto& c : cases) {
-    builder.OnError(u"continueOnError");
-    builder.OnError(c.given);
-    EXPECT_EQ(builder.OnError(), c.stored) << toUtf8(c.given);
-  }
   builder.Initialize();
-  EXPECT_EQ(builder.OnError(), u"stopOnError");
   builder.OnError(u" rollbackOnError ");
   builder.AddHeaders();
   builder.AddFooters();
@@ -291,38 +271,6 @@ TEST(DroXmlBuilderTest, SixteenBitCountersOverflow) {
   EXPECT_TRUE(raisesRuntime([&] { b.AddElementAggregateSimple(u"A"); }, RuntimeError::kOverflow));
   b.AddAggregateEnd();
   EXPECT_EQ(xml(b).substr(xml(b).size() - 6), "</A>\r\n");
-}
-
-TEST(DroXmlBuilderTest, IsSuccessRsJudgesTheFirstRequestOnly) {
-  const Text ok = u"<CustomerQueryRs requestID=\"2\" statusCode=\"0\" statusSeverity=\"Info\">";
-  const struct {
-    Text response;
-    const char16_t* reqId;
-    bool success;
-  } cases[] = {
-      {ok, u"2", true},
-      {ok, u"", true},
-      {ok, u"3", false},
-      {u"<CustomerQueryRs requestID=\"2\" statusCode=\"1\">", u"2", false},
-      {u"<CustomerQueryRs statusCode=\"0\">", u"", false},
-      {u"<A statusCode=\"0\" requestID=\"2\">", u"2", false},
-      {u"<A requestID=\"2\" statusCode=\"1\"/><B requestID=\"3\" statusCode=\"0\"/>", u"3", false},
-      {u"<A requestID=\"2\" statusCode=\"0\"/><B requestID=\"3\" statusCode=\"1\"/>", u"", true},
-      {u"<A requestID=\"2\"><B statusCode=\"0\">", u"2", true},
-      {u"<A requestID=\"2", u"2", false},
-      {u"", u"", false},
-  };
-  DroXmlBuilder b;
-  for (const auto& c : cases) {
-    EXPECT_EQ(b.IsSuccessRs(c.response, c.reqId), c.success) << toUtf8(c.response);
-  }
-  // A status code without its closing quote cannot be read: the runtime's 5.
-  for (const Text response :
-       {u"<A requestID=\"2\" statusCode=\"0", u"<A requestID=\"2\" statusCode="}) {
-    EXPECT_TRUE(
-        raisesRuntime([&] { b.IsSuccessRs(response, u"2"); }, RuntimeError::kInvalidProcedureCall))
-        << toUtf8(response);
-  }
 }
 
 TEST(DroXmlBuilderTest, HostBuildsByNameAndNumbersRequestsFromTwo) {
