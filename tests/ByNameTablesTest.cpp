@@ -1,0 +1,138 @@
+// Tables of steps run through the by-name surface, as a host's script would, each step's
+// outcome compared with the one the table gives. One step a line:
+//   new DroCustomer                 a fresh object of that ProgID for the steps below
+//   BillAddress.City = "Storrs"     let, then the property read back
+//   ParseRs("<A/>", 5)              a call (a get where the member is a property)
+// then "=> " and the outcome: "text", a number, true, false, Empty, Nothing, object CLASS,
+// or error NUMBER SOURCE: DESCRIPTION. Texts use \t \r \n \" \\.
+// DROQBXML_WRITE_GOLDENS=1 rewrites the outcomes.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "droqbxml/component/ClassFactory.hpp"
+#include "tests/TestSupport.hpp"
+
+namespace droqbxml {
+namespace {
+
+std::string quoted(const Text& text) {
+  std::string out = "\"";
+  for (const char c : toUtf8(text)) {
+    const char* escape = c == '\t' ? "\\t" : c == '\r' ? "\\r" : c == '\n' ? "\\n" : nullptr;
+    out += escape ? escape : c == '"' || c == '\\' ? std::string{'\\', c} : std::string(1, c);
+  }
+  return out + "\"";
+}
+
+std::string shown(const Variant& value) {
+  switch (value.kind()) {
+    case Variant::Kind::String:
+      return quoted(value.toText());
+    case Variant::Kind::Boolean:
+      return value.toBoolean() ? "true" : "false";
+    case Variant::Kind::Empty:
+      return "Empty";
+    case Variant::Kind::Object:
+      return value.toObject() ? "object " + toUtf8(value.toObject()->className()) : "Nothing";
+    default:
+      return toUtf8(value.toText());
+  }
+}
+
+// Where the quoted text opening at `at` ends (one past its closing quote).
+size_t afterQuoted(const std::string& text, size_t at) {
+  for (++at; text[at] != '"'; ++at) at += text[at] == '\\' ? 1 : 0;
+  return at + 1;
+}
+
+// A quoted text (escapes undone), true, false, a number with a point, or a whole number.
+Variant argument(const std::string& token) {
+  if (token == "true" || token == "false") return Variant(token == "true");
+  if (token.front() != '"') {
+    if (token.find('.') != std::string::npos) return Variant(std::stod(token));
+    return Variant(static_cast<int32_t>(std::stol(token)));
+  }
+  std::string value;
+  for (size_t i = 1; i + 1 < token.size(); ++i) {
+    const bool escaped = token[i] == '\\';
+    const char c = token[i += escaped];
+    value += !escaped ? c : c == 't' ? '\t' : c == 'r' ? '\r' : c == 'n' ? '\n' : c;
+  }
+  return Variant(fromUtf8(value));
+}
+
+std::string outcome(Ref<Object>& object, const std::string& step) {
+  try {
+    if (step.starts_with("new ")) {
+      object = CreateObject(u"DroQbXml." + fromUtf8(step.substr(4)));
+      return toUtf8(object->className()) == step.substr(4) ? "" : shown(Variant(object));
+    }
+    Ref<Object> target = object;
+    Variant result;
+    for (size_t at = 0; at < step.size(); ++at) {
+      if (at != 0) target = result.toObject();
+      const size_t end = step.find_first_of(".( ", at);
+      const Text name = fromUtf8(step.substr(at, end - at));
+      std::vector<Variant> args;
+      for (at = std::min(end, step.size());
+           at < step.size() && step[at] != '.' && step[at] != ' ';) {
+        const size_t from = step.find_first_not_of(' ', at + 1);
+        at = step[from] == '"' ? afterQuoted(step, from) : step.find_first_of(",)", from);
+        if (from != at) args.push_back(argument(step.substr(from, at - from)));
+        at += step[at] == ')' ? 1 : 0;
+      }
+      if (at < step.size() && step[at] == ' ') {  // " = value"
+        target->let(name, argument(step.substr(at + 3)));
+        return shown(target->get(name));
+      }
+      const int32_t id = target->memberId(name);
+      const bool method = target->classInfo().hasKind(id, MemberKind::Method);
+      result = target->invoke(id, method ? MemberKind::Method : MemberKind::Get, args);
+    }
+    return shown(result);
+  } catch (const ComError& error) {
+    char number[16];
+    std::snprintf(number, sizeof number, error.number() < 0 ? "0x%08X" : "%d", error.number());
+    const std::string description = quoted(error.description());
+    return std::string("error ") + number + " " + toUtf8(error.source()) + ": " +
+           description.substr(1, description.size() - 2);
+  }
+}
+
+// Runs testdata/<name> step by step and checks each outcome.
+void runTable(const std::string& name) {
+  const std::string path = std::string(DROQBXML_TESTDATA_DIR) + "/" + name;
+  std::istringstream lines(test::readFile(path));
+  std::string table;
+  std::string line;
+  Ref<Object> object;
+  for (int number = 1; std::getline(lines, line); ++number) {
+    size_t arrow = 0;
+    while (arrow < line.size() && line.compare(arrow, 3, " =>") != 0) {
+      arrow = line[arrow] == '"' ? afterQuoted(line, arrow) : arrow + 1;
+    }
+    const std::string step = line.substr(0, arrow);
+    const std::string got = line.empty() || line[0] == '#' ? "" : outcome(object, step);
+    table += (got.empty() ? step : step + " => " + got) + "\n";
+    EXPECT_EQ(line + "\n", table.substr(table.rfind('\n', table.size() - 2) + 1))
+        << name << ":" << number;
+  }
+  if (const char* write = std::getenv("DROQBXML_WRITE_GOLDENS"); write && *write == '1') {
+    test::writeFile(path, table);
+  }
+}
+
+// Record setters: trim rules, checks and limits, cut values, setters that ignore their
+// argument, emptiness flags, and the items collection.
+TEST(ByNameTablesTest, RecordSetters) { runTable("records/setters_by_name.txt"); }
+
+// The element's trimming and attribute index, OnError's alternatives, the success test.
+TEST(ByNameTablesTest, ElementAndBuilderRules) { runTable("checks/element_and_builder_rules.txt"); }
+
+}  // namespace
+}  // namespace droqbxml
