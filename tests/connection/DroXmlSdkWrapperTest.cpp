@@ -260,25 +260,6 @@ TEST_F(DroXmlSdkWrapperTest, TestForSdkComms) {
   EXPECT_EQ(other.ResponseStatus(), RSUnsetCoFile);
 }
 
-TEST_F(DroXmlSdkWrapperTest, ReadsStatusCodesAsLeadingNumbers) {
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"statusCode=\"3140abc\""), 3140);
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"statusCode=\"\""), 0);
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"statusCode=\"2.5\""), 2);
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"statusCode=\"x1\""), 0);
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"a statusCode=\"1\" statusCode=\"0\""), 1);
-  EXPECT_EQ(DroXmlSdkWrapper::ReadStatusCode(u"status=\"0\""), RSUnknown);
-  EXPECT_TRUE(test::raisesRuntime([] { DroXmlSdkWrapper::ReadStatusCode(u"statusCode=\"0"); },
-                                  RuntimeError::kInvalidProcedureCall));
-  EXPECT_TRUE(test::raisesRuntime([] { DroXmlSdkWrapper::ReadStatusCode(u"statusCode="); },
-                                  RuntimeError::kInvalidProcedureCall));
-  EXPECT_TRUE(DroXmlSdkWrapper::IsIncompleteQueryResponse(
-      u"The query request has not been fully completed. There was a required element "
-      u"(\"X\") that could not be found in QuickBooks."));
-  EXPECT_FALSE(DroXmlSdkWrapper::IsIncompleteQueryResponse(
-      u") that could not be found in QuickBooks. The query request has not been fully "
-      u"completed. There was a required element ("));
-}
-
 TEST_F(DroXmlSdkWrapperTest, ReachableByName) {
   auto wrapper = std::make_shared<DroXmlSdkWrapper>();
   wrapper->let(u"CompanyFilePath", u" C:\\co.qbw ");

@@ -1,8 +1,8 @@
-// Code page, path mapping, clock formats and file errors.
+// Path mapping, file errors and the fixed clock (the code page and date formats:
+// testdata/calls/runtime_conversions.txt).
 #include <gtest/gtest.h>
 
 #include "droqbxml/runtime/Clock.hpp"
-#include "droqbxml/runtime/Codepage.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
 #include "tests/TestSupport.hpp"
 
@@ -10,20 +10,6 @@ namespace droqbxml {
 namespace {
 
 using test::raisesRuntime;
-
-TEST(CodepageTest, UsesWindows1252) {
-  EXPECT_EQ(ansiCode(u'A'), 65);
-  EXPECT_EQ(ansiCode(u'\u20ac'), 128);
-  EXPECT_EQ(ansiCode(u'\u00e9'), 233);
-  EXPECT_EQ(ansiCode(u'\u0081'), 0x81);
-  EXPECT_EQ(ansiCode(u'\u4e2d'), 63);
-  EXPECT_EQ(ansiCode(u'\u0080'), 63);  // not in cp1252: 0x80 is the euro sign
-  EXPECT_EQ(ansiChar(128), u'\u20ac');
-  EXPECT_EQ(ansiChar(0x9d), u'\u009d');
-  EXPECT_TRUE(raisesRuntime([] { ansiChar(256); }, RuntimeError::kInvalidProcedureCall));
-  EXPECT_EQ(unicodeChar(-1), u'\uffff');
-  EXPECT_TRUE(raisesRuntime([] { unicodeChar(65536); }, RuntimeError::kInvalidProcedureCall));
-}
 
 TEST(FileSystemTest, MapsDrivesAndBackslashes) {
   test::TemporaryDrive drive;
@@ -66,17 +52,7 @@ TEST(FileSystemTest, FileNumbersRunOutAt511) {
   EXPECT_EQ(FileNumber::take().value(), 5);
 }
 
-TEST(ClockTest, FormatsOleDatesAndTheFixedClock) {
-  EXPECT_EQ(formatLongDateTime({2026, 11, 15, 0, 24, 51}), u"Sun Nov 15, 2026  12:24:51 AM");
-  EXPECT_EQ(formatLongDateTime({2024, 2, 29, 13, 5, 9}), u"Thu Feb 29, 2024  01:05:09 PM");
-  EXPECT_EQ(formatLongDateTime({2026, 1, 5, 12, 0, 0}), u"Mon Jan 05, 2026  12:00:00 PM");
-  EXPECT_EQ(formatIsoDateTime({2026, 11, 15, 13, 5, 9}), u"2026-11-15 13:05:09");
-  EXPECT_EQ(formatIsoDateTime(kZeroDate), u"1899-12-30 00:00:00");
-  EXPECT_EQ(fromOleDate(0), kZeroDate);
-  EXPECT_EQ(fromOleDate(46341.75), (LocalTime{2026, 11, 15, 18, 0, 0}));
-  EXPECT_EQ(fromOleDate(-1.25), (LocalTime{1899, 12, 29, 6, 0, 0}));
-  EXPECT_DOUBLE_EQ(toOleDate({1899, 12, 29, 6, 0, 0}), -1.25);
-  EXPECT_DOUBLE_EQ(toOleDate({2026, 11, 15, 18, 0, 0}), 46341.75);
+TEST(ClockTest, TheFixedClock) {
   {
     ScopedClock fixed({2001, 2, 3, 4, 5, 6});
     EXPECT_EQ(now(), (LocalTime{2001, 2, 3, 4, 5, 6}));

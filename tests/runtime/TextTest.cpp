@@ -1,5 +1,5 @@
-// Trimming, case folding, search, the UTF-8 edges, and the fast converters against a plain
-// reference.
+// The UTF-8 edges, and the fast converters against a plain reference (trimming, case and
+// search: testdata/calls/runtime_conversions.txt).
 #include <gtest/gtest.h>
 
 #include <random>
@@ -12,24 +12,6 @@
 
 namespace droqbxml {
 namespace {
-
-TEST(TextTest, TrimAndCaseTouchSpacesAndAsciiOnly) {
-  EXPECT_EQ(trim(u"  a b  "), u"a b");
-  EXPECT_EQ(trim(u"\t a \r\n"), u"\t a \r\n");
-  EXPECT_EQ(trim(u"   "), u"");
-  EXPECT_EQ(upperAscii(u"abc\u00e9z"), u"ABC\u00e9Z");
-  EXPECT_TRUE(equalsIgnoreCase(u"DroItemsCol", u"droitemscol"));
-  EXPECT_FALSE(equalsIgnoreCase(u"\u00e9", u"\u00c9"));
-}
-
-TEST(TextTest, InStrIsOneBased) {
-  EXPECT_EQ(inStr(1, u"abcabc", u"c"), 3);
-  EXPECT_EQ(inStr(4, u"abcabc", u"c"), 6);
-  EXPECT_EQ(inStr(7, u"abcabc", u"c"), 0);
-  EXPECT_EQ(inStr(1, u"abc", u"x"), 0);
-  EXPECT_TRUE(
-      test::raisesRuntime([] { inStr(0, u"abc", u"a"); }, RuntimeError::kInvalidProcedureCall));
-}
 
 TEST(TextTest, Utf8EdgesReplaceWhatCannotConvert) {
   const Text text = u"A\u00e9\u20ac\U0001F600\0Z";

@@ -1,5 +1,5 @@
-// The request handlers' own pieces: QuickBooks' number conversion and formats, text reduced to
-// ISO-8859-1, the clock and its fixed present, and the stored form of fields.
+// The request handlers' own pieces: the clock and its fixed present, and the stored form of
+// fields (numbers and text: testdata/calls/stand_in_values.txt).
 #include <gtest/gtest.h>
 
 #include <cstdint>
@@ -10,89 +10,10 @@
 
 #include "simulator/handlers/Clock.hpp"
 #include "simulator/handlers/Fields.hpp"
-#include "simulator/handlers/Values.hpp"
 #include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml::simulator::handlers {
 namespace {
-
-TEST(RequestHandlersValuesTest, NumbersConvertAsQuickBooksConvertsThem) {
-  struct Case {
-    const char* text;
-    NumberKind kind;
-    std::optional<int64_t> value;
-  };
-  const Case cases[] = {
-      {"12", NumberKind::Amount, 12 * kScale},
-      {"-12.50", NumberKind::Amount, -1250 * kCent},
-      {"+0.05", NumberKind::Amount, 5 * kCent},
-      {"246.9", NumberKind::Amount, std::nullopt},  // an amount has two decimals or none
-      {"246.901", NumberKind::Amount, std::nullopt},
-      {"246.", NumberKind::Amount, std::nullopt},
-      {".50", NumberKind::Amount, std::nullopt},
-      {"1234567890123.00", NumberKind::Amount, 123456789012300 * kCent},
-      {"12345678901234", NumberKind::Amount, std::nullopt},
-      {"1,000.00", NumberKind::Amount, std::nullopt},
-      {"0.12345", NumberKind::Price, 12345},
-      {"0.123456", NumberKind::Price, std::nullopt},
-      {"85.5", NumberKind::Price, 8550000},
-      {"12345678901", NumberKind::Price, std::nullopt},
-      {"2.5", NumberKind::Quantity, 250000},
-      {"1e3", NumberKind::Quantity, std::nullopt},
-      {"7.25", NumberKind::Percent, 725000},
-      {"", NumberKind::Percent, std::nullopt},
-      {"-", NumberKind::Percent, std::nullopt},
-  };
-  for (const Case& each : cases) {
-    EXPECT_EQ(parseNumber(each.text, each.kind), each.value) << each.text;
-  }
-}
-
-TEST(RequestHandlersValuesTest, NumbersAreWrittenInEachTypesForm) {
-  EXPECT_EQ(formatNumber(0, NumberKind::Amount), "0.00");
-  EXPECT_EQ(formatNumber(-1250 * kCent, NumberKind::Amount), "-12.50");
-  EXPECT_EQ(formatNumber(-1, NumberKind::Amount), "0.00");  // no "-0.00"
-  EXPECT_EQ(formatNumber(12345, NumberKind::Amount), "0.12");
-  EXPECT_EQ(formatNumber(85 * kScale, NumberKind::Price), "85.00");
-  EXPECT_EQ(formatNumber(12500, NumberKind::Price), "0.125");
-  EXPECT_EQ(formatNumber(-33333, NumberKind::Price), "-0.33333");
-  EXPECT_EQ(formatNumber(2 * kScale, NumberKind::Quantity), "2");
-  EXPECT_EQ(formatNumber(250000, NumberKind::Quantity), "2.5");
-  EXPECT_EQ(formatNumber(0, NumberKind::Quantity), "0");
-  EXPECT_EQ(formatNumber(750000, NumberKind::Percent), "7.50");
-  EXPECT_EQ(formatNumber(INT64_MIN + 1, NumberKind::Quantity), "-92233720368547.75807");
-}
-
-TEST(RequestHandlersValuesTest, ArithmeticRoundsHalfAwayFromZero) {
-  EXPECT_EQ(roundToCents(500), 1000);  // 0.005 -> 0.01
-  EXPECT_EQ(roundToCents(-500), -1000);
-  EXPECT_EQ(roundToCents(499), 0);
-  EXPECT_EQ(multiply(3 * kScale, 33333), 99999);
-  EXPECT_EQ(multiply(2, 250000), 5);  // 0.00002 * 2.5 = 0.00005
-  // Products beyond 64 bits before scaling back still come out exact.
-  EXPECT_EQ(multiply(9999999999 * kScale, 90000), 899999999910000);
-  EXPECT_EQ(divide(300 * kScale, 4 * kScale), 75 * kScale);
-  EXPECT_EQ(divide(1 * kScale, 3 * kScale), 33333);
-  EXPECT_EQ(divide(2 * kScale, 3 * kScale), 66667);
-  EXPECT_EQ(divide(5, 0), 0);
-  EXPECT_EQ(percentOf(63500000, 750000), 4762500);  // 7.5 % of 635.00 = 47.625
-  EXPECT_EQ(roundToCents(percentOf(10 * kCent, 750000)), 1 * kCent);
-}
-
-TEST(RequestHandlersValuesTest, TextKeepsIso88591AndReplacesTheRest) {
-  EXPECT_EQ(latin1Text("plain & <tags>"), "plain & <tags>");
-  EXPECT_EQ(latin1Text("caf\xC3\xA9 \xC3\xBF"), "caf\xC3\xA9 \xC3\xBF");  // é and ÿ stay
-  EXPECT_EQ(latin1Text("5\xE2\x82\xAC"), "5?");                           // the euro sign
-  EXPECT_EQ(latin1Text("\xF0\x9F\x98\x80!"), "?!");                       // one ? per character
-  EXPECT_EQ(latin1Text("\xC3"), "?");                                     // cut short
-  EXPECT_EQ(latin1Text("a\xFF"
-                       "b"),
-            "a?b");                        // not UTF-8
-  EXPECT_EQ(latin1Text("\xC1\x81"), "?");  // overlong "A"
-  EXPECT_EQ(booleanText("1"), "true");
-  EXPECT_EQ(booleanText("false"), "false");
-  EXPECT_EQ(booleanText("0"), "false");
-}
 
 TEST(RequestHandlersClockTest, AFixedPresentSetsTheTimeAndTheLocalOffset) {
   const test::ScopedVariable now("DROQBXML_SIMULATOR_NOW", "2009-03-02T10:40:23-05:00");
