@@ -131,6 +131,10 @@ void runTable(const std::string& name) {
 // argument, emptiness flags, and the items collection.
 TEST(ByNameTablesTest, RecordSetters) { runTable("records/setters_by_name.txt"); }
 
+// Records read from responses: finding the own response, required elements, the sales
+// sides, sales tax group members, the order of the contact fields; transaction lines.
+TEST(ByNameTablesTest, RecordReading) { runTable("records/parse_by_name.txt"); }
+
 // The element's trimming and attribute index, OnError's alternatives, the success test.
 TEST(ByNameTablesTest, ElementAndBuilderRules) { runTable("checks/element_and_builder_rules.txt"); }
 

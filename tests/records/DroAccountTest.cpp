@@ -1,6 +1,6 @@
-// The account record: reading real and made-up account responses, finding its own response,
-// its dump that opens with "False", and the account collection (setter limits: in
-// testdata/records/setters_by_name.txt).
+// The account record: reading a real account response, its dump that opens with "False", and
+// the account collection (finding its own response and its setter limits: in the tables
+// testdata/records/parse_by_name.txt and setters_by_name.txt).
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
@@ -11,15 +11,6 @@
 
 namespace droqbxml {
 namespace {
-
-Text accountRs(const Text& id, const Text& body) {
-  return u"<AccountQueryRs requestID=\"" + id + u"\" statusCode=\"0\"><AccountRet>" + body +
-         u"</AccountRet></AccountQueryRs>";
-}
-const Text kHeader =
-    u"<ListID>1-1</ListID><TimeCreated>t</TimeCreated><TimeModified>t</TimeModified>"
-    u"<EditSequence>9</EditSequence><Name>Bank</Name><FullName>Bank</FullName>"
-    u"<IsActive>true</IsActive>";
 
 TEST(DroAccountTest, ReadsARealQueryResponse) {
   const Text response = test::sharedResponse("qbxml-gem__account_query_rs.xml");
@@ -39,32 +30,6 @@ TEST(DroAccountTest, ReadsARealQueryResponse) {
   EXPECT_EQ(account.Balance(), u"951.65");
   EXPECT_TRUE(account.ParentRef()->IsEmpty());
   EXPECT_TRUE(test::matchesGolden(account.PrintOut(), "records/account_checking.txt"));
-}
-
-TEST(DroAccountTest, FindsItsOwnResponse) {
-  const Text response = accountRs(u"8", kHeader + u"<Sublevel>0</Sublevel>");
-  DroAccount account;
-  EXPECT_EQ(account.ParseRs(u"<AccountQueryRs requestID=\"2\"/>"), 0);  // no "<AccountRet>"
-  EXPECT_EQ(account.ParseRs(u"<AccountRet><ListID>1</ListID>", 1), 1);  // no "requestID="
-  account.RequestID(u"7");
-  const int32_t closingQuote = static_cast<int32_t>(response.find(u"\" status")) + 1;
-  EXPECT_EQ(account.ParseRs(response, -3), closingQuote);
-  EXPECT_EQ(account.ListID(), u"");
-  account.RequestID(u"8");
-  EXPECT_EQ(account.ParseRs(response, 0), 1);
-  EXPECT_EQ(account.ListID(), u"1-1");
-  DroAccount any;  // RequestID "" reads any response
-  EXPECT_EQ(any.ParseRs(response), 1);
-  EXPECT_EQ(any.Name(), u"Bank");
-}
-
-TEST(DroAccountTest, MissingSublevelRaisesAfterTheHeaderWasRead) {
-  DroAccount account;
-  EXPECT_TRUE(test::raises([&] { account.ParseRs(accountRs(u"2", kHeader)); }, PARING,
-                           u"DroQbXml.basCommonProcs.getElementValue",
-                           u"The response returned a an empty '<AccountRet><Sublevel>'.\r\n"
-                           u"This element is not allowed to be empty."));
-  EXPECT_EQ(account.IsActive(), u"true");
 }
 
 TEST(DroAccountTest, TheFreshDumpOpensWithFalse) {

@@ -145,44 +145,8 @@ TEST(DroCustomerTest, FindsItsResponseByRequestIdentifier) {
   EXPECT_GT(cursor, 0);
 }
 
-TEST(DroCustomerTest, MissingRequiredElementKeepsWhatWasRead) {
-  const Text broken =
-      queryResponse(u"2",
-                    u"<CustomerRet><ListID>1</ListID><TimeCreated>t</TimeCreated><TimeModified>t"
-                    u"</TimeModified><Name>N</Name></CustomerRet>");
-  DroCustomer customer;
-  EXPECT_TRUE(test::raises([&] { customer.ParseRs(broken); }, PARING,
-                           u"DroQbXml.basCommonProcs.getElementValue",
-                           u"The response returned a an empty '<CustomerRet><EditSequence>'.\r\n"
-                           u"This element is not allowed to be empty."));
-  EXPECT_EQ(customer.ListID(), u"1");
-  EXPECT_EQ(customer.Name(), u"");
-  // A value its setter refuses raises from the parse too.
-  DroCustomer refused;
-  EXPECT_TRUE(test::raisesRefusal(
-      [&] {
-        refused.ParseRs(queryResponse(u"2", customerRet(u"X", u"<JobStatus>Late</JobStatus>")));
-      },
-      JOB_STATUS, u"CheckJobStatus", u"Late", u"job status"));
-}
-
 TEST(DroCustomerTest, FreshDump) {
   EXPECT_TRUE(test::matchesGolden(DroCustomer().PrintOut(), "records/customer_new.txt"));
-}
-
-// The contact fields stand one after another; each is read from where the one before it
-// ended, so they must be read in the order QuickBooks writes them.
-TEST(DroCustomerTest, ReadsTheContactFieldsInTheirOrder) {
-  DroCustomer customer;
-  customer.ParseRs(queryResponse(
-      u"2", customerRet(u"Lee",
-                        u"<PrintAs>L</PrintAs><Phone>1</Phone><Mobile>2</Mobile><Pager>3"
-                        u"</Pager><AltPhone>4</AltPhone><Fax>5</Fax><Email>6</Email>"
-                        u"<Contact>7</Contact><AltContact>8</AltContact>")));
-  EXPECT_EQ(customer.PrintAs() + customer.Phone() + customer.Mobile() + customer.Pager() +
-                customer.AltPhone() + customer.Fax() + customer.Email() + customer.Contact() +
-                customer.AltContact(),
-            u"L1234678");  // Fax is never read
 }
 
 // Two large responses of one length read one after the other by name: each call copies the

@@ -28,7 +28,6 @@ Text rs(const Text& kind, const Text& body, const Text& id = u"2") {
   return u"<" + kind + u"QueryRs requestID=\"" + id + u"\"><" + kind + u"Ret>" + body + u"</" +
          kind + u"Ret></" + kind + u"QueryRs>";
 }
-const Text kEmptyElement = u"The response returned a an empty '";
 
 TEST(DroItemTest, ReadsTheRealInventoryAddResponse) {
   const Text response = test::sharedResponse("qbxml-gem__item_inventory_add_rs.xml");
@@ -46,56 +45,6 @@ TEST(DroItemTest, ReadsTheRealInventoryAddResponse) {
   EXPECT_EQ(item.QuantityOnHand(), u".00000");
   EXPECT_EQ(item.AverageCost(), u".00000");
   EXPECT_TRUE(test::matchesGolden(item.PrintOut(), "records/item_inventory_product.txt"));
-}
-
-TEST(DroItemTest, SalesSidesAreReadOneOrTheOther) {
-  DroItemNonInventory item;
-  item.SalesOrPurchase()->PricePercent(u"7.50");
-  const Text both =
-      u"<SalesOrPurchase><Desc>Grout</Desc><Price>2.5</Price>"
-      u"<PricePercent>9</PricePercent><AccountRef><FullName>Sales</FullName>"
-      u"</AccountRef></SalesOrPurchase><SalesAndPurchase><SalesDesc>x</SalesDesc>"
-      u"</SalesAndPurchase>";
-  item.ParseRs(rs(u"ItemNonInventory", header() + u"<Sublevel>0</Sublevel>" + both));
-  EXPECT_EQ(item.SalesOrPurchase()->Price(), u"2.50000");
-  EXPECT_EQ(item.SalesOrPurchase()->PricePercent(), u"7.5");  // never read from a response
-  EXPECT_EQ(item.SalesOrPurchase()->AccountRef()->FullName(), u"Sales");
-  EXPECT_TRUE(item.SalesAndPurchase()->IsEmpty());
-
-  DroItemOtherCharge other;
-  other.ParseRs(
-      rs(u"ItemOtherCharge", header() + u"<Sublevel>0</Sublevel><SalesAndPurchase><SalesDesc>Haul"
-                                        u"</SalesDesc><IncomeAccountRef><ListID>4</ListID>"
-                                        u"</IncomeAccountRef><PurchaseCost>3</PurchaseCost>"
-                                        u"</SalesAndPurchase>"));
-  EXPECT_TRUE(other.SalesOrPurchase()->IsEmpty());
-  EXPECT_EQ(other.SalesAndPurchase()->SalesDesc(), u"Haul");
-  EXPECT_EQ(other.SalesAndPurchase()->PurchaseCost(), u"3.00000");
-  EXPECT_FALSE(other.SalesAndPurchase()->IsEmpty());
-  EXPECT_EQ(other.ItemType(), udItemOtherCharge);
-}
-
-TEST(DroItemTest, SublevelIsRequiredButForServices) {
-  DroItemService service;
-  EXPECT_EQ(service.ItemType(), 9);
-  EXPECT_EQ(service.ParseRs(rs(u"ItemService", header())), 1);
-  EXPECT_EQ(service.IsActive(), u"true");
-  DroItemInventory inventory;
-  EXPECT_TRUE(test::raises([&] { inventory.ParseRs(rs(u"ItemInventory", header())); }, PARING,
-                           u"DroQbXml.basCommonProcs.getElementValue",
-                           kEmptyElement + u"<ItemInventoryRet><Sublevel>'.\r\n"
-                                           u"This element is not allowed to be empty."));
-  // Another kind's response, and a response cut short.
-  EXPECT_EQ(inventory.ParseRs(rs(u"ItemService", header())), 0);
-  EXPECT_TRUE(test::raises(
-      [&] { inventory.ParseRs(rs(u"ItemInventory", header()).substr(0, 120)); }, PARING,
-      u"DroQbXml.basCommonProcs.getElementValue",
-      kEmptyElement + u"<ItemInventoryRet><TimeModified>'.\r\nThis element is not allowed to be "
-                      u"empty."));
-  // A value its setter refuses raises from inside the read.
-  EXPECT_TRUE(test::raisesRefusal(
-      [&] { inventory.ParseRs(rs(u"ItemInventory", header() + u"<Sublevel>7</Sublevel>")); },
-      TYPE_INT, u"CheckINTTYPE", u"7", u"INTTYPE"));
 }
 
 TEST(DroItemTest, GroupLinesKeepTheFirstOfLooseDuplicates) {
@@ -123,18 +72,6 @@ TEST(DroItemTest, GroupLinesKeepTheFirstOfLooseDuplicates) {
   EXPECT_TRUE(empty.IsEmpty());
   empty.ItemRef()->ListID(u"X");
   EXPECT_FALSE(empty.IsEmpty());  // worked out again on every read
-}
-
-TEST(DroItemTest, SalesTaxGroupMembersReadFromTheGroupsStart) {
-  const Text response = rs(u"ItemSalesTaxGroup", header(false) + u"<ItemDesc>Both</ItemDesc>") +
-                        rs(u"ItemSalesTax", header(false) + u"<TaxRate>7.50</TaxRate>", u"3");
-  DroItemSalesTaxGroup group;
-  const auto member = group.ItemSalesTaxRefs()->Add(Variant(u"ItemSalesTax"));
-  group.ParseRs(response);
-  EXPECT_EQ(group.ItemDesc(), u"Both");
-  EXPECT_EQ(std::static_pointer_cast<DroItemSalesTax>(member)->TaxRate(), u"7.5");
-  group.ItemSalesTaxRefs()->Add(Variant(9));
-  EXPECT_TRUE(test::raisesRuntime([&] { group.ParseRs(response); }, RuntimeError::kTypeMismatch));
 }
 
 TEST(DroItemTest, FreshDumps) {

@@ -3,7 +3,6 @@
 // mark, unbounded searches, swallowed errors) and the dumps.
 #include <gtest/gtest.h>
 
-#include "droqbxml/component/ClassFactory.hpp"
 #include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/diagnostics/clsMyErr.hpp"
@@ -229,25 +228,6 @@ TEST(TransactionTest, Dumps) {
   // Once the estimate holds a group, its dump is the runtime's 13.
   estimate.EstimateLineGroups()->Add();
   EXPECT_TRUE(test::raisesRuntime([&] { (void)estimate.PrintOut(); }, RuntimeError::kTypeMismatch));
-}
-
-TEST(TransactionTest, ReachableByName) {
-  const auto estimate = CreateObject(u"DroQbXml.DroEstimate");
-  const auto lines = estimate->get(u"EstimateLines").toObject();
-  const auto added = lines->call(u"Add", {Variant(u"Tile")}).toObject();
-  added->let(u"ItemType", Variant(int32_t{udItemSubtotal}));
-  EXPECT_EQ(lines->call(u"Item", {Variant(1)}).toObject()->get(u"ItemType").toLong(),
-            udItemSubtotal);
-  added->call(u"Class_Treminate");  // releases the line's references
-  EXPECT_TRUE(
-      test::raisesRuntime([&] { (void)added->get(u"PrintOut"); }, RuntimeError::kObjectNotSet));
-  const auto invoice = CreateObject(u"DroQbXml.DroInvoice");
-  EXPECT_TRUE(test::raisesRuntime([&] { (void)invoice->get(u"PrintOut"); },
-                                  RuntimeError::kMemberNotSupported));
-  for (const char16_t* name : {u"DroEstimateLineCol", u"DroEstimateLineGroupCol",
-                               u"DroInvoiceLineCol", u"DroInvoiceLineGroupCol"}) {
-    EXPECT_EQ(CreateObject(Text(u"DroQbXml.") + name)->classInfo().className(), name);
-  }
 }
 
 }  // namespace
