@@ -20,10 +20,13 @@
 #include "droqbxml/runtime/Codepage.hpp"
 #include "droqbxml/runtime/Numbers.hpp"
 #include "droqbxml/runtime/Text.hpp"
+#include "droqbxml/runtime/Variant.hpp"
 #include "simulator/RequestDocument.hpp"
+#include "simulator/handlers/Clock.hpp"
 #include "simulator/handlers/Values.hpp"
 #include "simulator/internal/SchemaCheck.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml {
 namespace {
@@ -105,6 +108,19 @@ LocalTime time(const Args& a) {
   return {number(a[0]), number(a[1]), number(a[2]), number(a[3]), number(a[4]), number(a[5])};
 }
 
+// A Variant of the kind a[0] holding a[1].
+Variant variant(const Args& a) {
+  const std::string& kind = a[0];
+  if (kind == "Boolean") return Variant(a[1] == "true");
+  if (kind == "Integer") return Variant(static_cast<int16_t>(number(a[1])));
+  if (kind == "Long") return Variant(number(a[1]));
+  if (kind == "Double") return Variant(real(a[1]));
+  if (kind == "Currency") return Variant::currency(whole(a[1]));
+  if (kind == "Date") return Variant::date(real(a[1]));
+  if (kind == "String") return Variant(text(a[1]));
+  return kind == "Null" ? Variant::null() : kind == "Missing" ? Variant::missing() : Variant();
+}
+
 NumberKind kind(const std::string& word) {
   const std::map<std::string, NumberKind> kinds{{"Amount", NumberKind::Amount},
                                                 {"Price", NumberKind::Price},
@@ -179,6 +195,13 @@ const std::map<std::string, std::function<std::string(const Args&)>>& functions(
       CALL(upperAscii, upperAscii(TextView(text(a[0])))),
       CALL(equalsIgnoreCase, equalsIgnoreCase(text(a[0]), text(a[1]))),
       CALL(inStr, inStr(number(a[0]), text(a[1]), text(a[2]))),
+      // Variants given as kind and value.
+      CALL(typeName, variant(a).typeName()),
+      CALL(toLong, variant(a).toLong()),
+      CALL(toInteger, variant(a).toInteger()),
+      CALL(toCurrency, variant(a).toCurrency()),
+      CALL(toText, variant(a).toText()),
+      CALL(toBoolean, variant(a).toBoolean()),
       // Dates: times given as year, month, day, hour, minute, second.
       CALL(formatLongDateTime, formatLongDateTime(time(a))),
       CALL(formatIsoDateTime, formatIsoDateTime(time(a))),
@@ -196,6 +219,11 @@ const std::map<std::string, std::function<std::string(const Args&)>>& functions(
       CALL(percentOf, percentOf(whole(a[0]), whole(a[1]))),
       CALL(latin1Text, latin1Text(a[0])),
       CALL(booleanText, booleanText(a[0])),
+      // The stand-in's clock, its present fixed to a[0] by DROQBXML_SIMULATOR_NOW.
+      CALL(standInNow, (::setenv("DROQBXML_SIMULATOR_NOW", a[0].c_str(), 1), currentTime())),
+      CALL(formatDateTime, formatDateTime(whole(a[0]))),
+      CALL(formatDate, formatDate(whole(a[0]))),
+      CALL(parseDateTime, parseDateTime(a[0], a[1] == "endOfDay")),
       // The stand-in reading requests: a leaf's value; the problems of a document, of the
       // builder's document with onError a[0] and the lines after it, or of text after it;
       // the version of a document read without problems.
@@ -249,11 +277,16 @@ void runTable(const std::string& name) {
   }
 }
 
-// Numeric text read and written as the platform does, the code page, trimming and search.
+// Numeric text read and written as the platform does, Variant conversions, the code page,
+// trimming and search, dates, and the session wrapper's status codes.
 TEST(CallTablesTest, RuntimeConversions) { runTable("runtime_conversions.txt"); }
 
-// QuickBooks' number conversion, formats and rounding, and text reduced to ISO-8859-1.
-TEST(CallTablesTest, StandInValues) { runTable("stand_in_values.txt"); }
+// QuickBooks' number conversion, formats and rounding, text reduced to ISO-8859-1, and the
+// stand-in's clock with its fixed present.
+TEST(CallTablesTest, StandInValues) {
+  const test::ScopedVariable now("DROQBXML_SIMULATOR_NOW");
+  runTable("stand_in_values.txt");
+}
 
 // Leaf values, prologs, versions, attributes and malformed documents as the stand-in reads
 // them, each with its problems.
