@@ -50,9 +50,12 @@ size_t afterQuoted(const std::string& text, size_t at) {
   return at + 1;
 }
 
-// A quoted text (escapes undone), true, false, a number with a point, or a whole number.
+// A quoted text (escapes undone), true, false, Empty, Null, a currency (in 1/10000, ending
+// in @), a number with a point, or a whole number.
 Variant argument(const std::string& token) {
   if (token == "true" || token == "false") return Variant(token == "true");
+  if (token == "Empty" || token == "Null") return token == "Null" ? Variant::null() : Variant();
+  if (token.ends_with('@')) return Variant::currency(std::stoll(token));  // in 1/10000
   if (token.front() != '"') {
     if (token.find('.') != std::string::npos) return Variant(std::stod(token));
     return Variant(static_cast<int32_t>(std::stol(token)));
