@@ -604,60 +604,26 @@ TEST_F(RequestHandlersTest, OlderQbxmlVersionsGetOnlyTheElementsTheyKnew) {
 TEST_F(RequestHandlersTest, RecordsHaveTheShapeOfQuickBooksOwnResponses) {
   const std::filesystem::path folder = kShared / "qbxml" / "responses";
   if (!std::filesystem::exists(folder)) GTEST_SKIP() << "no real responses at " << folder;
-  const std::string university =
-      "BillAddress{Addr1=Eastern XYZ University;Addr2=College of Engineering;Addr3=123 XYZ Road;"
-      "City=Storrs-Mansfield;State=CT;PostalCode=";
-  const struct {
-    bool salesTax;
-    const char* record;
-    const char* real;
-    const char* values;  // the elements whose values are compared
-    std::string requests;
-  } cases[] = {
-      // Customer adds of companies without sales tax, with the same fields set.
-      {false, "CustomerRet", "CustomerAddRs__qbwc-gem_test_helper.xml", "JobStatus TotalBalance",
-       "CustomerAdd{Name=Joseph Customer;CompanyName=Joes Garage;Salutation=Mr;FirstName=Joe;"
-       "LastName=Customer;BillAddress{Addr1=123 Main St.;City=Mountain View;State=CA;"
-       "PostalCode=94566};Email=joecustomer@gmail.com;AccountNumber=89087;CreditLimit=2000.00}"},
-      {false, "CustomerRet", "qbxml-gem__customer_add_rs.xml", "",
-       "CustomerAdd{Name=20706 - Eastern XYZ University;CompanyName=Eastern XYZ University;"
-       "FirstName=Keith;LastName=Palmer;" +
-           university +
-           "88130;Country=USA};Phone=860-634-1602;AltPhone=860-429-0021;Fax=860-429-5183;"
-           "Email=keith@consolibyte.com;Contact=Keith Palmer}"},
-      // An inventory part as QuickBooks completes it.
-      {true, "ItemInventoryRet", "qbxml-gem__item_inventory_add_rs.xml",
-       "SalesPrice PurchaseCost QuantityOnHand AverageCost QuantityOnOrder",
-       "ItemInventoryAdd{Name=product name here;SalesDesc=your sales description here;"
-       "SalesPrice=85;IncomeAccountRef=Sales;COGSAccountRef=Cost of Goods Sold;"
-       "AssetAccountRef=Inventory Asset}"},
-      {true, "EstimateRet", "EstimateQueryRs__php-qbwc-tester_index-512729409.xml",
-       "Desc Quantity Rate Amount Subtotal",
-       "CustomerAdd{Name=176007582 - Eastern XYZ University;" + university +
-           "06268;Country=USA}};EstimateAdd{CustomerRef=176007582 - Eastern XYZ University;"
-           "EstimateLineAdd{ItemRef=Labor;Desc=Test Estimate Line Item;Quantity=2;Rate=1.00};"
-           "EstimateLineAdd{ItemRef=Nails;Desc=Test Estimate 2;Quantity=4;Rate=1.00};"
-           "EstimateLineAdd{Desc=Test Esitmate 3}}"},
-      {true, "InvoiceLineRet", "InvoiceQueryRs__ruby-fixture_index-31094748425.xml",
-       "Quantity Rate Amount Subtotal AppliedAmount BalanceRemaining IsPaid IsToBePrinted",
-       "ItemServiceAdd{Name=Awesome;SalesTaxCodeRef=Non;SalesOrPurchase{Price=10}};InvoiceAdd{"
-       "CustomerRef=176007582 - Eastern XYZ University;InvoiceLineAdd{ItemRef=Awesome;"
-       "Quantity=1}}"},
-  };
+  // Two lines a case: whether the company has sales tax, the record, the real response's
+  // file and the elements whose values are compared; then the requests.
+  std::istringstream cases(test::readFile(kTestData / "simulator" / "real_response_cases.txt"));
   const std::set<std::string> notKept{"TemplateRef", "BillAddressBlock"};
   bool salesTax = true;
-  for (const auto& c : cases) {
-    if (c.salesTax != salesTax || !company_) {
-      newCompany(c.salesTax);
-      salesTax = c.salesTax;
+  for (std::string line, requests; std::getline(cases, line);) {
+    if (line.starts_with("#") || !std::getline(cases, requests)) continue;
+    std::istringstream words(line);
+    std::string tax, record, file;
+    words >> tax >> record >> file;
+    if ((tax == "tax") != salesTax || !company_) {
+      newCompany(tax == "tax");
+      salesTax = tax == "tax";
       answer(kItems);
     }
-    const std::string mine = answer(rq(c.requests));
-    const std::string real = test::readFile(folder / c.real);
-    EXPECT_EQ(shape(mine, c.record, notKept), shape(real, c.record, notKept)) << c.real;
-    std::istringstream values(c.values);
-    for (std::string element; values >> element;) {
-      EXPECT_EQ(texts(mine, element), texts(real, element)) << c.real << " " << element;
+    const std::string mine = answer(rq(requests));
+    const std::string real = test::readFile(folder / file);
+    EXPECT_EQ(shape(mine, record, notKept), shape(real, record, notKept)) << file;
+    for (std::string element; words >> element;) {
+      EXPECT_EQ(texts(mine, element), texts(real, element)) << file << " " << element;
     }
   }
 }
