@@ -10,6 +10,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <functional>
+#include <initializer_list>
 #include <memory>
 #include <regex>
 #include <set>
@@ -204,6 +205,18 @@ Texts texts(const std::string& response, const std::string& name) {
     table.push_back(line);
   }
   return test::linesMatchGolden(table, name);
+}
+
+// Appends "label Element: value | value" for each of `elements` in `part` (for a golden file).
+void listValues(Texts& lines, const std::string& label, const std::string& part,
+                std::initializer_list<const char*> elements) {
+  for (const char* element : elements) {
+    std::string line = label + " " + element + ":";
+    for (const std::string& value : texts(part, element)) {
+      line += (line.ends_with(":") ? " " : " | ") + value;
+    }
+    lines.push_back(line);
+  }
 }
 
 // The part of the response from the first start tag `name` (at or after `from`) to its end
@@ -468,33 +481,20 @@ TEST_F(RequestHandlersTest, LinesArePricedAndTaxedAsQuickBooksDoes) {
       // Tax is rounded once on the taxable total, half away from zero.
       "InvoiceAdd{CustomerRef=Acme;InvoiceLineAdd{Desc=Odd job;Amount=0.10;"
       "SalesTaxCodeRef=Tax}}"));
-  const std::string invoice = section(response, "InvoiceAddRs");
-  EXPECT_EQ(texts(invoice, "Amount"),
-            (Texts{"1.00", "212.50", "300.00", "-30.00", "483.50", "340.00", "25.00"}));
-  EXPECT_EQ(texts(invoice, "Rate"), (Texts{"0.33333", "85.00", "75.00", "85.00", "0.125"}));
-  EXPECT_EQ(texts(invoice, "RatePercent"), Texts{"10.00"});
-  EXPECT_EQ(texts(invoice, "Desc"),
-            (Texts{"Box of nails", "Labor, per hour", "Labor, per hour", "Loyalty discount",
-                   "Subtotal", "Kitchen fitting kit", "Labor, per hour", "Box of nails"}));
-  EXPECT_EQ(texts(invoice, "Quantity"), (Texts{"3", "2.5", "4", "2", "4", "200"}));
-  EXPECT_EQ(texts(invoice, "TotalAmount"), Texts{"365.00"});
-  // 848.50 of lines, all taxable, at 7.5 % + 1.25 % = 74.24375.
-  EXPECT_EQ(texts(invoice, "Subtotal"), Texts{"848.50"});
-  EXPECT_EQ(texts(invoice, "SalesTaxPercentage"), Texts{"8.75"});
-  EXPECT_EQ(texts(invoice, "SalesTaxTotal"), Texts{"74.24"});
-  EXPECT_EQ(texts(invoice, "BalanceRemaining"), Texts{"922.74"});
-
+  // 848.50 of lines, all taxable, at 7.5 % + 1.25 % = 74.24375; 0.10 taxed at 0.0075.
+  Texts values;
+  listValues(values, "invoice", section(response, "InvoiceAddRs"),
+             {"Amount", "Rate", "RatePercent", "Desc", "Quantity", "TotalAmount", "Subtotal",
+              "SalesTaxPercentage", "SalesTaxTotal", "BalanceRemaining"});
   const std::string estimate = section(response, "EstimateRet");
-  EXPECT_EQ(texts(estimate, "Rate"), (Texts{"85.00", "28.75", "30.00"}));
-  EXPECT_EQ(texts(estimate, "Amount"), (Texts{"85.00", "57.50", "30.00"}));
-  EXPECT_EQ(texts(estimate, "Subtotal"), Texts{"172.50"});
-  EXPECT_EQ(texts(estimate, "SalesTaxTotal"), Texts{"0.00"});
-  EXPECT_EQ(texts(estimate, "TotalAmount"), Texts{"172.50"});
-  EXPECT_EQ(texts(section(estimate, "CustomerSalesTaxCodeRef"), "FullName"), Texts{"NON"});
-
-  const std::string small = section(response, "InvoiceRet", response.find("</EstimateAddRs>"));
-  EXPECT_EQ(texts(small, "SalesTaxTotal"), Texts{"0.01"});  // 0.0075
-  EXPECT_EQ(texts(small, "RefNumber"), Texts{"2"});
+  listValues(values, "estimate", estimate,
+             {"Rate", "Amount", "Subtotal", "SalesTaxTotal", "TotalAmount"});
+  listValues(values, "estimate tax code", section(estimate, "CustomerSalesTaxCodeRef"),
+             {"FullName"});
+  listValues(values, "small invoice",
+             section(response, "InvoiceRet", response.find("</EstimateAddRs>")),
+             {"SalesTaxTotal", "RefNumber"});
+  EXPECT_TRUE(test::linesMatchGolden(values, "priced_lines.txt"));
 }
 
 TEST_F(RequestHandlersTest, InvoicesSellFromStock) {
@@ -520,13 +520,10 @@ TEST_F(RequestHandlersTest, TransactionsNumberThemselvesAndTakeTheCustomersDefau
          "BillAddress{Addr1=Other}};EstimateAdd{CustomerRef=Acme;EstimateLineAdd{Desc=Survey}};"
          "InvoiceAdd{CustomerRef=Acme;RefNumber=123456789012}"),
       "continueOnError");
-  EXPECT_EQ(texts(response, "RefNumber"), (Texts{"INV-0999", "INV-1000", "1"}));
-  EXPECT_EQ(texts(response, "TxnID"), (Texts{"1-1236008423", "2-1236008423", "3-1236008423"}));
-  EXPECT_EQ(texts(response, "TxnLineID"), Texts{"4-1236008423"});
-  EXPECT_EQ(texts(response, "TxnNumber"), (Texts{"1", "2", "3"}));
-  EXPECT_EQ(texts(response, "TxnDate"), (Texts{"2009-03-02", "2009-03-02", "2009-03-02"}));
-  EXPECT_EQ(texts(response, "Addr1"),
-            (Texts{"1 Main St", "Dock 4", "Other", "Dock 4", "1 Main St", "Dock 4"}));
+  Texts values;
+  listValues(values, "transactions", response,
+             {"RefNumber", "TxnID", "TxnLineID", "TxnNumber", "TxnDate", "Addr1"});
+  EXPECT_TRUE(test::linesMatchGolden(values, "numbered_transactions.txt"));
   ASSERT_EQ(statuses(response).size(), 4u);
   EXPECT_EQ(statuses(response)[3],
             "InvoiceAddRs 3070 Error The string &quot;123456789012&quot; in the field "
