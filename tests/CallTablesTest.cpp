@@ -191,6 +191,7 @@ const std::map<std::string, std::function<std::string(const Args&)>>& functions(
       CALL(ansiCode, ansiCode(unit(a[0]))),
       CALL(ansiChar, ansiChar(number(a[0]))),
       CALL(unicodeChar, unicodeChar(number(a[0]))),
+      CALL(fromUtf8, fromUtf8(a[0])),
       CALL(trim, trim(text(a[0]))),
       CALL(upperAscii, upperAscii(TextView(text(a[0])))),
       CALL(equalsIgnoreCase, equalsIgnoreCase(text(a[0]), text(a[1]))),
