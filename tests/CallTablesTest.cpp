@@ -261,8 +261,7 @@ std::string outcome(const std::string& call) {
 void runTable(const std::string& name) {
   const std::string path = std::string(DROQBXML_TESTDATA_DIR) + "/calls/" + name;
   std::istringstream lines(test::readFile(path));
-  std::string table;
-  std::string line;
+  std::string table, line;
   for (int number = 1; std::getline(lines, line); ++number) {
     size_t arrow = 0;
     while (arrow < line.size() && line.compare(arrow, 3, " =>") != 0) {
