@@ -15,24 +15,15 @@
 #include <vector>
 
 #include "droqbxml/component/ClassFactory.hpp"
-#include "tests/TestSupport.hpp"
+#include "tests/TableSupport.hpp"
 
 namespace droqbxml {
 namespace {
 
-std::string quoted(const Text& text) {
-  std::string out = "\"";
-  for (const char c : toUtf8(text)) {
-    const char* escape = c == '\t' ? "\\t" : c == '\r' ? "\\r" : c == '\n' ? "\\n" : nullptr;
-    out += escape ? escape : c == '"' || c == '\\' ? std::string{'\\', c} : std::string(1, c);
-  }
-  return out + "\"";
-}
-
 std::string shown(const Variant& value) {
   switch (value.kind()) {
     case Variant::Kind::String:
-      return quoted(value.toText());
+      return test::quoted(toUtf8(value.toText()), false);
     case Variant::Kind::Boolean:
       return value.toBoolean() ? "true" : "false";
     case Variant::Kind::Empty:
@@ -42,12 +33,6 @@ std::string shown(const Variant& value) {
     default:
       return toUtf8(value.toText());
   }
-}
-
-// Where the quoted text opening at `at` ends (one past its closing quote).
-size_t afterQuoted(const std::string& text, size_t at) {
-  for (++at; text[at] != '"'; ++at) at += text[at] == '\\' ? 1 : 0;
-  return at + 1;
 }
 
 // A quoted text (escapes undone), true, false, Empty, Null, a currency (in 1/10000, ending
@@ -60,13 +45,7 @@ Variant argument(const std::string& token) {
     if (token.find('.') != std::string::npos) return Variant(std::stod(token));
     return Variant(static_cast<int32_t>(std::stol(token)));
   }
-  std::string value;
-  for (size_t i = 1; i + 1 < token.size(); ++i) {
-    const bool escaped = token[i] == '\\';
-    const char c = token[i += escaped];
-    value += !escaped ? c : c == 't' ? '\t' : c == 'r' ? '\r' : c == 'n' ? '\n' : c;
-  }
-  return Variant(fromUtf8(value));
+  return Variant(fromUtf8(test::unquoted(token)));
 }
 
 std::string outcome(Ref<Object>& object, const std::string& step) {
@@ -85,7 +64,7 @@ std::string outcome(Ref<Object>& object, const std::string& step) {
       for (at = std::min(end, step.size());
            at < step.size() && step[at] != '.' && step[at] != ' ';) {
         const size_t from = step.find_first_not_of(' ', at + 1);
-        at = step[from] == '"' ? afterQuoted(step, from) : step.find_first_of(",)", from);
+        at = step[from] == '"' ? test::afterQuoted(step, from) : step.find_first_of(",)", from);
         if (from != at) args.push_back(argument(step.substr(from, at - from)));
         at += step[at] == ')' ? 1 : 0;
       }
@@ -99,35 +78,14 @@ std::string outcome(Ref<Object>& object, const std::string& step) {
     }
     return shown(result);
   } catch (const ComError& error) {
-    char number[16];
-    std::snprintf(number, sizeof number, error.number() < 0 ? "0x%08X" : "%d", error.number());
-    const std::string description = quoted(error.description());
-    return std::string("error ") + number + " " + toUtf8(error.source()) + ": " +
-           description.substr(1, description.size() - 2);
+    return test::errorOutcome(error, false);
   }
 }
 
-// Runs testdata/<name> step by step and checks each outcome.
+// Runs testdata/<name> step by step, "new" lines starting on a fresh object.
 void runTable(const std::string& name) {
-  const std::string path = std::string(DROQBXML_TESTDATA_DIR) + "/" + name;
-  std::istringstream lines(test::readFile(path));
-  std::string table;
-  std::string line;
   Ref<Object> object;
-  for (int number = 1; std::getline(lines, line); ++number) {
-    size_t arrow = 0;
-    while (arrow < line.size() && line.compare(arrow, 3, " =>") != 0) {
-      arrow = line[arrow] == '"' ? afterQuoted(line, arrow) : arrow + 1;
-    }
-    const std::string step = line.substr(0, arrow);
-    const std::string got = line.empty() || line[0] == '#' ? "" : outcome(object, step);
-    table += (got.empty() ? step : step + " => " + got) + "\n";
-    EXPECT_EQ(line + "\n", table.substr(table.rfind('\n', table.size() - 2) + 1))
-        << name << ":" << number;
-  }
-  if (const char* write = std::getenv("DROQBXML_WRITE_GOLDENS"); write && *write == '1') {
-    test::writeFile(path, table);
-  }
+  test::runTable(name, [&](const std::string& step) { return outcome(object, step); });
 }
 
 // Record setters: trim rules, checks and limits, cut values, setters that ignore their
@@ -140,6 +98,10 @@ TEST(ByNameTablesTest, RecordReading) { runTable("records/parse_by_name.txt"); }
 
 // The element's trimming and attribute index, OnError's alternatives, the success test.
 TEST(ByNameTablesTest, ElementAndBuilderRules) { runTable("checks/element_and_builder_rules.txt"); }
+
+// Every published value check: closed lists, amounts, integers, strings, dates, prices,
+// quantities and percents, their refusals and the runtime's failures they let through.
+TEST(ByNameTablesTest, ValueChecks) { runTable("checks/value_checks.txt"); }
 
 }  // namespace
 }  // namespace droqbxml

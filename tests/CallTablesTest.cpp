@@ -25,7 +25,7 @@
 #include "simulator/handlers/Clock.hpp"
 #include "simulator/handlers/Values.hpp"
 #include "simulator/internal/SchemaCheck.hpp"
-#include "tests/TestSupport.hpp"
+#include "tests/TableSupport.hpp"
 #include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml {
@@ -35,20 +35,7 @@ using Args = std::vector<std::string>;
 using simulator::handlers::NumberKind;
 using simulator::internal::ValueType;
 
-std::string shown(const std::string& bytes) {
-  std::string out = "\"";
-  for (const char c : bytes) {
-    const auto b = static_cast<unsigned char>(c);
-    const char* escape = c == '\t' ? "\\t" : c == '\r' ? "\\r" : c == '\n' ? "\\n" : nullptr;
-    char hex[8];
-    std::snprintf(hex, sizeof hex, "\\x%02X", b);
-    out += escape                  ? escape
-           : c == '"' || c == '\\' ? std::string{'\\', c}
-           : b < 0x20 || b > 0x7E  ? hex
-                                   : std::string(1, c);
-  }
-  return out + "\"";
-}
+std::string shown(const std::string& bytes) { return test::quoted(bytes, true); }
 std::string shown(const Text& text) { return shown(toUtf8(text)); }
 std::string shown(bool value) { return value ? "true" : "false"; }
 template <std::integral T>
@@ -72,28 +59,6 @@ std::string shown(const std::vector<std::string>& list) {
   std::string out;
   for (const std::string& each : list) out += (out.empty() ? "" : ", ") + shown(each);
   return out.empty() ? "none" : out;
-}
-
-// Where the quoted text opening at `at` ends (one past its closing quote).
-size_t afterQuoted(const std::string& text, size_t at) {
-  for (++at; text[at] != '"'; ++at) at += text[at] == '\\' ? 1 : 0;
-  return at + 1;
-}
-
-std::string unquoted(const std::string& token) {
-  if (token.empty() || token.front() != '"') return token;
-  std::string value;
-  for (size_t i = 1; i + 1 < token.size(); ++i) {
-    if (token[i] != '\\') {
-      value += token[i];
-    } else if (const char c = token[++i]; c == 'x') {
-      value += static_cast<char>(std::stoi(token.substr(i + 1, 2), nullptr, 16));
-      i += 2;
-    } else {
-      value += c == 't' ? '\t' : c == 'r' ? '\r' : c == 'n' ? '\n' : c;
-    }
-  }
-  return value;
 }
 
 Text text(const std::string& arg) { return fromUtf8(arg); }
@@ -243,39 +208,20 @@ std::string outcome(const std::string& call) {
   Args args;
   for (size_t at = open + 1; at < call.size() && call[at] != ')';) {
     const size_t from = call.find_first_not_of(' ', at);
-    const size_t end = call[from] == '"' ? afterQuoted(call, from) : call.find_first_of(",)", from);
-    args.push_back(unquoted(call.substr(from, end - from)));
+    const size_t end =
+        call[from] == '"' ? test::afterQuoted(call, from) : call.find_first_of(",)", from);
+    args.push_back(test::unquoted(call.substr(from, end - from)));
     at = call[end] == ',' ? end + 1 : end;
   }
   try {
     return functions().at(call.substr(0, open))(args);
   } catch (const ComError& error) {
-    char number[16];
-    std::snprintf(number, sizeof number, error.number() < 0 ? "0x%08X" : "%d", error.number());
-    return std::string("error ") + number + " " + toUtf8(error.source()) + ": " +
-           toUtf8(error.description());
+    return test::errorOutcome(error, true);
   }
 }
 
 // Calls every line of testdata/calls/<name> and checks what each gives.
-void runTable(const std::string& name) {
-  const std::string path = std::string(DROQBXML_TESTDATA_DIR) + "/calls/" + name;
-  std::istringstream lines(test::readFile(path));
-  std::string table, line;
-  for (int number = 1; std::getline(lines, line); ++number) {
-    size_t arrow = 0;
-    while (arrow < line.size() && line.compare(arrow, 3, " =>") != 0) {
-      arrow = line[arrow] == '"' ? afterQuoted(line, arrow) : arrow + 1;
-    }
-    const std::string call = line.substr(0, arrow);
-    const std::string got = line.empty() || line[0] == '#' ? line : call + " => " + outcome(call);
-    EXPECT_EQ(line, got) << name << ":" << number;
-    table += got + "\n";
-  }
-  if (const char* write = std::getenv("DROQBXML_WRITE_GOLDENS"); write && *write == '1') {
-    test::writeFile(path, table);
-  }
-}
+void runTable(const std::string& name) { test::runTable("calls/" + name, outcome); }
 
 // Numeric text read and written as the platform does, Variant conversions, the code page,
 // trimming and search, dates, and the session wrapper's status codes.

@@ -4,9 +4,7 @@
 
 #include <array>
 #include <cstdint>
-#include <cstdio>
 #include <functional>
-#include <sstream>
 #include <string>
 #include <vector>
 
@@ -39,69 +37,6 @@ Text intCheck(const Text& value, int32_t mode, int32_t upper, int32_t lower) {
 
 Text strCheck(const Text& value, int16_t maxLen, bool truncate) {
   return CheckSTRTYPE(value, maxLen, truncate);
-}
-
-// One argument of a call in the table: "text" (with \\t, \\" and \\\\ escaped), an integer,
-// true or false.
-Variant argument(std::string_view text) {
-  if (text == "true" || text == "false") return Variant(text == "true");
-  if (text.front() != '"') return Variant(static_cast<int32_t>(std::stol(std::string(text))));
-  std::string value;
-  for (size_t i = 1; i + 1 < text.size(); ++i) {
-    if (text[i] == '\\')
-      value += text[++i] == 't' ? '\t' : text[i];
-    else
-      value += text[i];
-  }
-  return Variant(fromUtf8(value));
-}
-
-// What a call gives: => "result", or => error NUMBER SOURCE: DESCRIPTION.
-std::string outcome(const std::string& call) {
-  const size_t open = call.find('(');
-  std::vector<Variant> args;
-  std::string rest = call.substr(open + 1, call.rfind(')') - open - 1);
-  for (size_t at = 0; at < rest.size();) {
-    size_t end = at;
-    if (rest[at] == '"') {
-      for (end = at + 1; rest[end] != '"'; ++end) end += rest[end] == '\\' ? 1 : 0;
-      ++end;
-    } else {
-      end = std::min(rest.find(',', at), rest.size());
-    }
-    args.push_back(argument(std::string_view(rest).substr(at, end - at)));
-    at = end + 2;
-  }
-  try {
-    const auto module = CreateObject(u"DroQbXml.basValidations");
-    const Text result =
-        module->invoke(fromUtf8(call.substr(0, open)), MemberKind::Method, args).toText();
-    return "\"" + toUtf8(result) + "\"";
-  } catch (const ComError& error) {
-    char number[16];
-    std::snprintf(number, sizeof number, error.number() < 0 ? "0x%08X" : "%d", error.number());
-    return std::string("error ") + number + " " + toUtf8(error.source()) + ": " +
-           toUtf8(error.description());
-  }
-}
-
-// The published checks by name, each call of testdata/checks/value_checks.txt with what it
-// gives back or raises: closed lists, amounts, integers, strings, dates, prices, quantities
-// and percents, their refusals and the runtime's failures they let through.
-TEST(basValidationsTest, EveryCallOfTheTable) {
-  std::istringstream lines(
-      test::readFile(std::string(DROQBXML_TESTDATA_DIR) + "/checks/value_checks.txt"));
-  std::string table;
-  std::string line;
-  while (std::getline(lines, line)) {
-    if (line.starts_with("#")) {
-      table += line + "\n";
-      continue;
-    }
-    const std::string call = line.substr(0, line.find(" =>"));
-    table += call + " => " + outcome(call) + "\n";
-  }
-  EXPECT_TRUE(test::matchesGolden(fromUtf8(table), "checks/value_checks.txt"));
 }
 
 TEST(basValidationsTest, AmountAndQuantityOverflowIsRaisedUnderTheChecksName) {
@@ -152,8 +87,8 @@ TEST(basValidationsTest, HugeAndControlTextIsRefusedOrReported) {
   EXPECT_TRUE(raisesRuntime([&] { CheckDATETYPE(control); }, RuntimeError::kTypeMismatch));
 }
 
-// The table calls by name with text and typed arguments; names are matched without regard
-// to case, a number converts as text, and an unknown check is the runtime's 438.
+// The table of ByNameTablesTest calls every check by name; names are matched without
+// regard to case, a number converts as text, and an unknown check is the runtime's 438.
 TEST(basValidationsTest, ChecksAreReachableByName) {
   const auto module = CreateObject(u"DroQbXml.basValidations");
   EXPECT_EQ(module->className(), u"basValidations");
