@@ -8,3 +8,8 @@ product=$(exclude='^com/tests/' count 'droqbxml/*.cpp' 'droqbxml/*.hpp' 'simulat
   'cli/*.cpp' 'cli/*.hpp' 'com/*.cpp' 'com/*.hpp' 'com/*.S')
 tests=$(count 'tests/*.cpp' 'tests/*.hpp' 'tests/*.vbs' 'tests/*.js' 'com/tests/*.cpp')
 echo "product $product lines, tests $tests lines: tests are $((100 * tests / product))% of product"
+# The narrower count: the C++ tests against the library and the stand-in alone.
+narrow_tests=$(count 'tests/*.cpp' 'tests/*.hpp')
+narrow_product=$(count 'droqbxml/*.cpp' 'droqbxml/*.hpp' 'simulator/*.cpp' 'simulator/*.hpp')
+echo "C++ tests $narrow_tests lines against the library and stand-in $narrow_product:" \
+  "$((100 * narrow_tests / narrow_product))%"
