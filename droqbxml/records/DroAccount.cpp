@@ -9,7 +9,9 @@ const ClassInfo& DroAccount::typeInfo() {
     Members members;
     members.property(u"ParentRef", &C::ParentRef, &C::ParentRef);
     addFieldMembers(members, kFields);
-    members.method(u"ParseRs", &C::ParseRs).optional(1).getter(u"PrintOut", &C::PrintOut);
+    members.method(u"ParseRs", textParseRs(&C::ParseRs))
+        .optional(1)
+        .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroAccount", members.take());
   }();
   return info;

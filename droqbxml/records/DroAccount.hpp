@@ -9,6 +9,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -70,6 +71,10 @@ class DroAccount final : public ListRecordOf<DroAccount> {
   // "requestID="; the closing quote of another request's identifier (when RequestID is not
   // ""); otherwise reads the account and returns the start. BankNumber is never read.
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   // Opens with "False" and never writes "ACCOUNT:" (see the .cpp).
   Text PrintOut() const;
 

@@ -4,6 +4,7 @@
 
 #include "droqbxml/records/DroCustomerCol.hpp"
 #include "droqbxml/records/basCommonProcs.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 
 namespace droqbxml {
 
@@ -26,7 +27,7 @@ const ClassInfo& DroCustomer::typeInfo() {
     addFieldMembers(members, kFields);
     members.method(u"ParseCustInfo", &C::ParseCustInfo)
         .optional(1)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroCustomer", members.take());
@@ -58,6 +59,7 @@ void DroCustomer::applyRule(size_t index, const Text& checked) {
 }
 
 int32_t DroCustomer::ParseRs(const Text& Value, int32_t StartPoint) {
+  const internal::SearchScope scope(Value);
   int32_t pos = StartPoint < 1 ? 1 : StartPoint;
   int32_t q1 = 0;
   for (;;) {
@@ -100,6 +102,7 @@ int32_t DroCustomer::ParseRs(const Text& Value, int32_t StartPoint) {
 }
 
 int32_t DroCustomer::ParseCustInfo(const Text& sValueA, int32_t lStartPointA) {
+  const internal::SearchScope scope(sValueA);
   const int32_t pos = lStartPointA < 1 ? 1 : lStartPointA;
   if (basCommonProcs::findInResponse(pos, sValueA, u"<CustomerRet>") == 0) return 0;
   // Reading starts at the given position, not at the "<CustomerRet>" found.

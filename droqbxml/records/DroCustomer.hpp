@@ -10,6 +10,7 @@
 
 #include "droqbxml/records/DroAddress.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/Record.hpp"
 
 namespace droqbxml {
@@ -201,6 +202,10 @@ class DroCustomer final : public RecordOf<DroCustomer> {
   // StartPoint and reads its customer; returns the cursor for the next record, or the
   // position the search reached when nothing was read.
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

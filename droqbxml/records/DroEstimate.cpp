@@ -19,7 +19,9 @@ const ClassInfo& DroEstimate::typeInfo() {
         .property(u"EstimateLines", &C::EstimateLines, &C::EstimateLines)
         .property(u"EstimateLineGroups", &C::EstimateLineGroups, &C::EstimateLineGroups);
     addFieldMembers(members, kFields);
-    members.method(u"ParseRs", &C::ParseRs).optional(1).getter(u"PrintOut", &C::PrintOut);
+    members.method(u"ParseRs", textParseRs(&C::ParseRs))
+        .optional(1)
+        .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroEstimate", members.take());
   }();
   return info;

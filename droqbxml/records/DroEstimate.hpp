@@ -13,6 +13,7 @@
 #include "droqbxml/records/DroEstimateLineCol.hpp"
 #include "droqbxml/records/DroEstimateLineGroup.hpp"
 #include "droqbxml/records/DroEstimateLineGroupCol.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/Transaction.hpp"
 
 namespace droqbxml {
@@ -44,6 +45,10 @@ class DroEstimate final : public TxnRecordOf<DroEstimate, TxnKind::Estimate> {
   // and "TxnDate" required), the lines, the groups. Returns where reading stopped, or the
   // position reached when there is nothing to read.
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   // The header and one block per plain line. An estimate holding a line group is the
   // runtime's 13: the dump walks the groups as lines, and hosts have always had it so.
   Text PrintOut() const;

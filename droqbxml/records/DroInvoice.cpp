@@ -22,7 +22,7 @@ const ClassInfo& DroInvoice::typeInfo() {
         .property(u"InvoiceLines", &C::InvoiceLines, &C::InvoiceLines)
         .property(u"InvoiceLineGroups", &C::InvoiceLineGroups, &C::InvoiceLineGroups);
     addFieldMembers(members, kFields);
-    members.method(u"ParseRs", &C::ParseRs).optional(1);
+    members.method(u"ParseRs", textParseRs(&C::ParseRs)).optional(1);
     return ClassInfo(u"DroInvoice", members.take());
   }();
   return info;

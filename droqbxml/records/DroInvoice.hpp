@@ -13,6 +13,7 @@
 #include "droqbxml/records/DroInvoiceLineCol.hpp"
 #include "droqbxml/records/DroInvoiceLineGroup.hpp"
 #include "droqbxml/records/DroInvoiceLineGroupCol.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/Transaction.hpp"
 
 namespace droqbxml {
@@ -77,6 +78,10 @@ class DroInvoice final : public TxnRecordOf<DroInvoice, TxnKind::Invoice> {
   // As DroEstimate::ParseRs, for the "InvoiceAddRet" and its header order; a group's key
   // may be missing without an error.
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
 
  private:
   ObjectProperty<DroAccountRef> arAccountRef_;

@@ -10,7 +10,7 @@ const ClassInfo& DroItemDiscount::typeInfo() {
     members.property(u"ParentRef", &C::ParentRef, &C::ParentRef)
         .property(u"SalesTaxCodeRef", &C::SalesTaxCodeRef, &C::SalesTaxCodeRef)
         .property(u"AccountRef", &C::AccountRef, &C::AccountRef)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemDiscount", members.take());

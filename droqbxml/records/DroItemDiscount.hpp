@@ -6,6 +6,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -34,6 +35,10 @@ class DroItemDiscount final : public ItemRecordOf<DroItemDiscount> {
 
   // As DroAccount::ParseRs, for "<ItemDiscountRet>" (StartPoint by reference, unchanged).
   int32_t ParseRs(const Text& Value, const int32_t& StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, const int32_t& StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

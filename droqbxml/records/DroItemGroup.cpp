@@ -8,7 +8,7 @@ const ClassInfo& DroItemGroup::typeInfo() {
   static const ClassInfo info = [] {
     Members members = itemMembers();
     members.property(u"ItemGroupLines", &C::ItemGroupLines, &C::ItemGroupLines)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemGroup", members.take());

@@ -7,6 +7,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroItemGroupLineCol.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -29,6 +30,10 @@ class DroItemGroup final : public ItemRecordOf<DroItemGroup> {
   // As DroAccount::ParseRs, for "<ItemGroupRet>" (StartPoint by reference, unchanged); the
   // member lines are read after the header.
   int32_t ParseRs(const Text& Value, const int32_t& StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, const int32_t& StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

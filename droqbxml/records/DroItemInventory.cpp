@@ -13,7 +13,7 @@ const ClassInfo& DroItemInventory::typeInfo() {
         .property(u"COGSAccountRef", &C::COGSAccountRef, &C::COGSAccountRef)
         .property(u"PrefVendorRef", &C::PrefVendorRef, &C::PrefVendorRef)
         .property(u"AssetAccountRef", &C::AssetAccountRef, &C::AssetAccountRef)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemInventory", members.take());

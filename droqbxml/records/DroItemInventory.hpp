@@ -7,6 +7,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -74,6 +75,10 @@ class DroItemInventory final : public ItemRecordOf<DroItemInventory> {
 
   // As DroAccount::ParseRs, for "<ItemInventoryRet>".
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

@@ -9,7 +9,7 @@ const ClassInfo& DroItemPayment::typeInfo() {
     Members members = itemMembers();
     members.property(u"DepositToAccountRef", &C::DepositToAccountRef, &C::DepositToAccountRef)
         .property(u"PaymentMethodRef", &C::PaymentMethodRef, &C::PaymentMethodRef)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemPayment", members.take());

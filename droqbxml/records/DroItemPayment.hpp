@@ -6,6 +6,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -25,6 +26,10 @@ class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
 
   // As DroAccount::ParseRs, for "<ItemPaymentRet>".
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

@@ -7,7 +7,9 @@ const ClassInfo& DroItemPayrollItemWage::typeInfo() {
   using C = DroItemPayrollItemWage;
   static const ClassInfo info = [] {
     Members members = itemMembers();
-    members.method(u"ParseRs", &C::ParseRs).optional(1).getter(u"PrintOut", &C::PrintOut);
+    members.method(u"ParseRs", textParseRs(&C::ParseRs))
+        .optional(1)
+        .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemPayrollItemWage", members.take());
   }();
   return info;

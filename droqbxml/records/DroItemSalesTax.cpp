@@ -8,7 +8,7 @@ const ClassInfo& DroItemSalesTax::typeInfo() {
   static const ClassInfo info = [] {
     Members members = itemMembers();
     members.property(u"TaxVendorRef", &C::TaxVendorRef, &C::TaxVendorRef)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemSalesTax", members.take());

@@ -10,7 +10,7 @@ const ClassInfo& DroItemSalesTaxGroup::typeInfo() {
   static const ClassInfo info = [] {
     Members members = itemMembers();
     members.property(u"ItemSalesTaxRefs", &C::ItemSalesTaxRefs, &C::ItemSalesTaxRefs)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(u"DroItemSalesTaxGroup", members.take());

@@ -6,6 +6,7 @@
 #include <cstdint>
 
 #include "droqbxml/records/DroItemsCol.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -27,6 +28,10 @@ class DroItemSalesTaxGroup final : public ItemRecordOf<DroItemSalesTaxGroup> {
   // its own ParseRs on the same text from the group's start (a member of another class is
   // the runtime's 13).
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 
  private:

@@ -5,6 +5,7 @@
 #include <array>
 #include <cstdint>
 
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -19,6 +20,10 @@ class DroItemSubtotal final : public ItemRecordOf<DroItemSubtotal> {
 
   // As DroAccount::ParseRs, for "<ItemSubtotalRet>".
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   Text PrintOut() const;
 };
 

@@ -12,7 +12,7 @@ const ClassInfo& DroSalesItem<Kind>::typeInfo() {
         .property(u"SalesTaxCodeRef", &C::SalesTaxCodeRef, &C::SalesTaxCodeRef)
         .property(u"SalesOrPurchase", &C::SalesOrPurchase, &C::SalesOrPurchase)
         .property(u"SalesAndPurchase", &C::SalesAndPurchase, &C::SalesAndPurchase)
-        .method(u"ParseRs", &C::ParseRs)
+        .method(u"ParseRs", textParseRs(&C::ParseRs))
         .optional(1)
         .getter(u"PrintOut", &C::PrintOut);
     return ClassInfo(Text(kSpec.className), members.take());

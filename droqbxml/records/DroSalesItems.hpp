@@ -11,6 +11,7 @@
 #include "droqbxml/records/DroSalesAndPurchase.hpp"
 #include "droqbxml/records/DroSalesOrPurchase.hpp"
 #include "droqbxml/records/DroTypedRefs.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
 #include "droqbxml/records/ListRecord.hpp"
 
 namespace droqbxml {
@@ -55,6 +56,10 @@ class DroSalesItem final : public ItemRecordOf<DroSalesItem<Kind>> {
   // As DroAccount::ParseRs, for the kind's return element. The sales-and-purchase side is
   // read only when no "<SalesOrPurchase>" was found.
   int32_t ParseRs(const Text& Value, int32_t StartPoint = 0);
+  // The same read of the response's text, its searches answered from the response's index.
+  int32_t ParseRs(const IndexedResponse& Value, int32_t StartPoint = 0) {
+    return Value.read([&](const Text& text) { return ParseRs(text, StartPoint); });
+  }
   // The heading, "RequestID" without its TAB, the header, both references and both sides.
   Text PrintOut() const;
 

@@ -11,6 +11,7 @@
 
 #include "droqbxml/qbxml/Enumerations.hpp"
 #include "droqbxml/records/Record.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 
 namespace droqbxml {
 
@@ -112,6 +113,7 @@ class ListRecordOf : public RecordOf<Derived> {
   // elements, and returns the clamped start; otherwise what findOwnResponse says.
   template <class Body>
   int32_t parseList(const Text& Value, int32_t StartPoint, TextView returnTag, Body body) {
+    const internal::SearchScope scope(Value);
     const OwnResponse own = findOwnResponse(Value, StartPoint, returnTag, RequestID());
     if (!own.found) return own.result;
     int32_t start = own.cursor;

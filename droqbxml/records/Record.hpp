@@ -111,14 +111,21 @@ class ObjectProperty : public Ref<T> {
 struct OwnResponse {
   bool found = false;
   bool another = false;  // the identifier found is another request's
-  int32_t result = 0;  // the clamped start when found
-  int32_t cursor = 0;  // the closing quote of the request identifier
+  int32_t result = 0;    // the clamped start when found
+  int32_t cursor = 0;    // the closing quote of the request identifier
 };
 // From StartPoint (raised to 1): 0 without returnTag; the start without "requestID=" (or
 // with its quotes cut short); the closing-quote position (and another) when the identifier
 // is another request's and requestId is not ""; otherwise found.
 OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView returnTag,
                             const Text& requestId);
+
+// The ParseRs that reads a Text, picked from a record's two (the other reads an
+// IndexedResponse): the one bound by name.
+template <class C, class Start>
+constexpr auto textParseRs(int32_t (C::*parse)(const Text&, Start)) {
+  return parse;
+}
 
 // The base of every record with a field table: values, the set path and the late-bound
 // members of the fields.

@@ -6,6 +6,7 @@
 
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/records/basCommonProcs.hpp"
+#include "droqbxml/records/internal/TagIndex.hpp"
 #include "droqbxml/records/internal/TextSearch.hpp"
 #include "tests/TestSupport.hpp"
 
@@ -79,24 +80,38 @@ TEST(basCommonProcsTest, EmptyRequiredOrUnclosedElements) {
 
 TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   std::mt19937 random(7);
-  const std::u16string_view pieces[] = {u"<A>", u"</A>", u"<B>",  u"</B>", u"<A", u">",
-                                        u"x",   u"<",    u"<A><", u"<B/>", u"AB", u"\r\n"};
+  // Tags whose keys collide (same length and ends), attributes, self-closed and bare tags,
+  // and text that is not XML.
+  const std::u16string_view pieces[] = {
+      u"<A>",  u"</A>", u"<B>",  u"</B>", u"<A",          u">",        u"x",      u"<",
+      u"<A><", u"<B/>", u"AB",   u"\r\n", u"<AxB>",       u"<AyB>",    u"<A >",   u"< A>",
+      u"<!A>", u"<?A>", u"<<A>", u"<A/>", u"<A b=\"1\">", u"<\u00e9>", u"<AxB/>", u"<>"};
   Text text;
   while (text.size() < 100000) text += pieces[random() % std::size(pieces)];
   const Text other = text.substr(1);
-  // Inside a read's scope too, with cursors that go back as well as forward, and for a text
-  // the scope is not over.
+  const internal::TagIndex index(text);
+  // Inside a read's scope too (which indexes the text once its searches have gone far), with
+  // cursors that go back as well as forward, and for a text the scope is not over.
   const internal::SearchScope scope(text);
   for (int round = 0; round < 2000; ++round) {
     const size_t from = random() % (text.size() + 10);
-    for (const TextView pattern : {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"),
-                                   TextView(u"<C>"), TextView(u"A><"), TextView(u"<")}) {
-      ASSERT_EQ(internal::findForward(text, pattern, from), text.find(pattern, from))
+    for (const TextView pattern :
+         {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"), TextView(u"<C>"),
+          TextView(u"A><"), TextView(u"<"), TextView(u"<AxB>"), TextView(u"<AyB>"),
+          TextView(u"<AzB>"), TextView(u"<A >"), TextView(u"<A b=\"1\">"), TextView(u"<\u00e9>")}) {
+      const size_t expected = text.find(pattern, from);
+      ASSERT_EQ(internal::findForward(text, pattern, from), expected)
           << round << " " << toUtf8(Text(pattern));
-      ASSERT_EQ(internal::SearchScope::find(text, pattern, from), text.find(pattern, from));
+      ASSERT_EQ(internal::SearchScope::find(text, pattern, from), expected);
       ASSERT_EQ(internal::SearchScope::find(other, pattern, from), other.find(pattern, from));
+      if (internal::TagIndex::covers(pattern) && from <= text.size()) {
+        ASSERT_EQ(index.find(pattern, from), expected) << toUtf8(Text(pattern));
+      }
     }
   }
+  EXPECT_FALSE(internal::TagIndex::covers(u"<A b=\"1\">"));
+  EXPECT_FALSE(internal::TagIndex::covers(u"<B/>"));
+  EXPECT_TRUE(internal::TagIndex::covers(u"<A >"));
   // Matches at every offset near the end, where the wide comparison hands over.
   for (size_t size = 2; size < 40; ++size) {
     const Text tail = Text(size - 2, u'x') + u"<A";

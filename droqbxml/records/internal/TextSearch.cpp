@@ -4,7 +4,10 @@
 // large response (an element absent from the record) cheap.
 #include "droqbxml/records/internal/TextSearch.hpp"
 
+#include <algorithm>
 #include <cstdint>
+
+#include "droqbxml/records/internal/TagIndex.hpp"
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
@@ -54,12 +57,21 @@ size_t findForward(TextView text, TextView pattern, size_t from) {
 }
 
 namespace {
+
 thread_local SearchScope* openScope = nullptr;
+
+// Most searches of a read end close to where they start: this many code units from the
+// start are searched directly, before the memory or the index is consulted.
+constexpr size_t kNear = 256;
+// Shorter texts are never indexed: searching them to the end costs less.
+constexpr size_t kIndexedSize = 8192;
+
 }  // namespace
 
-SearchScope::SearchScope(const Text& text) {
+SearchScope::SearchScope(const Text& text, const TagIndex* index) {
   if (openScope != nullptr) return;
   text_ = &text;
+  index_ = index;
   openScope = this;
 }
 
@@ -69,19 +81,47 @@ SearchScope::~SearchScope() {
 
 size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
   SearchScope* scope = openScope;
-  if (scope == nullptr || scope->text_ != &text) return findForward(text, pattern, from);
-  auto known = scope->answers_.find(pattern);
-  if (known != scope->answers_.end()) {
-    const Answer& answer = known->second;
-    // Nothing from `from` on means nothing later either; a match from `from` is the first
-    // match from any start up to it.
-    if (from >= answer.from && (answer.at == Text::npos || from <= answer.at)) return answer.at;
-  } else {
-    known = scope->answers_.emplace(Text(pattern), Answer{}).first;
+  if (scope == nullptr || scope->text_ != &text || from > text.size()) {
+    return findForward(text, pattern, from);
   }
-  const size_t at = findForward(text, pattern, from);
-  known->second = Answer{from, at};
+  return scope->search(pattern, from);
+}
+
+size_t SearchScope::search(TextView pattern, size_t from) {
+  const TextView text = *text_;
+  const size_t nearEnd = std::min(text.size(), from + kNear);
+  size_t at = findForward(text.substr(0, nearEnd), pattern, from);
+  if (at != TextView::npos || nearEnd == text.size()) return at;
+  if (!answers_.empty() && remembered(pattern, from, at)) return at;
+  const bool isTag = TagIndex::covers(pattern);
+  if (isTag && index_ == nullptr && scanned_ > 2 * text.size() && text.size() >= kIndexedSize &&
+      text.size() <= UINT32_MAX) {
+    ownIndex_ = std::make_unique<TagIndex>(text);
+    index_ = ownIndex_.get();
+    answers_.clear();  // the index answers the tags now; the rest are searched again once
+  }
+  if (isTag && index_ != nullptr) return index_->find(pattern, from);
+  at = findForward(text, pattern, from);
+  scanned_ += (at == TextView::npos ? text.size() : at) - from;
+  remember(pattern, from, at);
   return at;
+}
+
+bool SearchScope::remembered(TextView pattern, size_t from, size_t& at) const {
+  const auto known = answers_.find(pattern);
+  if (known == answers_.end()) return false;
+  const Answer& answer = known->second;
+  // Nothing from `from` on means nothing later either; a match from `from` is the first
+  // match from any start up to it.
+  if (from < answer.from || (answer.at != TextView::npos && from > answer.at)) return false;
+  at = answer.at;
+  return true;
+}
+
+void SearchScope::remember(TextView pattern, size_t from, size_t at) {
+  auto known = answers_.find(pattern);
+  if (known == answers_.end()) known = answers_.emplace(Text(pattern), Answer{}).first;
+  known->second = Answer{from, at};
 }
 
 }  // namespace droqbxml::internal

@@ -5,30 +5,36 @@
 // and the next search still sees exactly the text it is given.
 //
 // Within one read (a SearchScope, open while one top-level ParseRs runs on one text that
-// nothing can change meanwhile) the answers are remembered per pattern: an element absent
-// from the rest of the text is searched to the end once, not once per line of a long
-// transaction.
+// nothing can change meanwhile) more is allowed: a search that runs far is remembered per
+// pattern, so an element absent from the rest of the text is searched to the end once, not
+// once per line of a long transaction; and once the searches of a read have gone over the
+// text twice, the read indexes its start tags (TagIndex) and looks tags up there. A read
+// over an IndexedResponse uses the response's own index from the start.
 #ifndef DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 #define DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 
 #include <cstddef>
 #include <functional>
+#include <memory>
 #include <unordered_map>
 
 #include "droqbxml/runtime/Text.hpp"
 
 namespace droqbxml::internal {
 
+class TagIndex;
+
 // The first position (0-based) at or after `from` where `pattern` occurs in `text`, or
 // Text::npos: exactly what text.find(pattern, from) gives.
 size_t findForward(TextView text, TextView pattern, size_t from);
 
-// Remembers the searches over `text` made on this thread while it is open. The first scope
+// Speeds up the searches over `text` made on this thread while it is open. The first scope
 // opened on a thread is the one that counts; scopes opened inside it do nothing, and
-// searches of any other text are not remembered.
+// searches of any other text are plain searches. `index`, when given, must be an index of
+// exactly `text`, which must outlive the scope.
 class SearchScope {
  public:
-  explicit SearchScope(const Text& text);
+  explicit SearchScope(const Text& text, const TagIndex* index = nullptr);
   ~SearchScope();
   SearchScope(const SearchScope&) = delete;
   SearchScope& operator=(const SearchScope&) = delete;
@@ -37,6 +43,10 @@ class SearchScope {
   static size_t find(const Text& text, TextView pattern, size_t from);
 
  private:
+  size_t search(TextView pattern, size_t from);
+  bool remembered(TextView pattern, size_t from, size_t& at) const;
+  void remember(TextView pattern, size_t from, size_t at);
+
   struct Answer {
     size_t from;  // the search started here
     size_t at;    // and found the pattern here (npos: nowhere after from)
@@ -46,6 +56,9 @@ class SearchScope {
     size_t operator()(TextView key) const noexcept { return std::hash<TextView>{}(key); }
   };
   const Text* text_ = nullptr;
+  const TagIndex* index_ = nullptr;
+  std::unique_ptr<TagIndex> ownIndex_;
+  size_t scanned_ = 0;  // code units gone over by searches that ran far
   std::unordered_map<Text, Answer, Hash, std::equal_to<>> answers_;
 };
 

@@ -1,0 +1,60 @@
+// Where each start tag of a response text stands, grouped by the tag's exact text, so that
+// searching a long response for "<Name>" is a lookup and a binary search. Built in one pass
+// over the text: every '<' and '>' is found eight code units at a time, and a start tag
+// joins its group by a short key (its length and the code units at its ends) checked
+// against the group's first tag; tags whose keys collide are told apart by their whole
+// text. Start tags with attributes or self-closed are left out: searches for them, like
+// any other search, go over the text.
+#ifndef DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
+#define DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
+
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <unordered_map>
+#include <vector>
+
+#include "droqbxml/runtime/Text.hpp"
+
+namespace droqbxml::internal {
+
+class TagIndex {
+ public:
+  // Indexes `text` (at most UINT32_MAX code units), which must outlive the index and not
+  // change: the index answers for that text only.
+  explicit TagIndex(TextView text);
+
+  // Whether the index answers searches for `pattern`: "<" + name + ">" where the name is
+  // not empty, holds no '<' or '>', does not start with '/', '?' or '!' and does not end
+  // with a quote or '/'.
+  static bool covers(TextView pattern);
+
+  // For a covered pattern: exactly text.find(pattern, from) of the indexed text.
+  size_t find(TextView pattern, size_t from) const;
+
+ private:
+  struct Slot {
+    uint32_t first = UINT32_MAX;  // the name's position in the text of the group's first tag
+    uint32_t length = 0;
+    uint32_t group = 0;
+  };
+
+  size_t slotOf(size_t length, char16_t first, char16_t last) const;
+  // The group of the name at `at` (`length` code units), made when new.
+  uint32_t groupOf(size_t at, size_t length);
+  // The group of `name`, or UINT32_MAX.
+  uint32_t findGroup(TextView name) const;
+
+  TextView text_;
+  std::vector<Slot> slots_;
+  unsigned slotBits_ = 0;
+  // Names whose key's slot belongs to another name.
+  std::unordered_map<TextView, uint32_t> others_;
+  uint32_t groups_ = 0;
+  std::vector<uint32_t> starts_;  // starts_[g] .. starts_[g + 1]: group g's range of at_
+  std::vector<uint32_t> at_;      // tag positions, grouped, ascending in a group
+};
+
+}  // namespace droqbxml::internal
+
+#endif  // DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_

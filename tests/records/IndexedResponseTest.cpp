@@ -1,0 +1,121 @@
+// Reading through an IndexedResponse gives exactly what reading the plain text gives: every
+// result, every value, every error, on random batches where optional elements, self-closed
+// forms and attributes come and go (so unbounded searches reach into later responses).
+#include <gtest/gtest.h>
+
+#include <random>
+
+#include "droqbxml/records/DroAccount.hpp"
+#include "droqbxml/records/DroCustomer.hpp"
+#include "droqbxml/records/DroInvoice.hpp"
+#include "droqbxml/records/DroInvoiceLine.hpp"
+#include "droqbxml/records/IndexedResponse.hpp"
+#include "tests/TestSupport.hpp"
+
+namespace droqbxml {
+namespace {
+
+class RandomBatch {
+ public:
+  explicit RandomBatch(unsigned seed) : random_(seed) {}
+
+  Text make(int responses) {
+    Text text = u"<QBXML><QBXMLMsgsRs>";
+    for (int i = 0; i < responses; ++i) {
+      const Text id = asciiText(std::to_string(i + 2));
+      switch (random_() % 3) {
+        case 0:
+          text += u"<CustomerQueryRs requestID=\"" + id + u"\"><CustomerRet>" + header() +
+                  maybe(u"CompanyName") + maybe(u"Phone") + maybe(u"Mobile") +
+                  maybe(u"BillAddress", maybe(u"Addr1") + maybe(u"City")) + maybe(u"Balance") +
+                  maybe(u"JobStatus", u"Closed") + u"</CustomerRet></CustomerQueryRs>";
+          break;
+        case 1:
+          text += u"<AccountQueryRs requestID=\"" + id + u"\"><AccountRet>" + header() +
+                  maybe(u"AccountType", u"Bank") + maybe(u"Desc") + maybe(u"Balance") +
+                  u"</AccountRet></AccountQueryRs>";
+          break;
+        default:
+          text += u"<InvoiceAddRs requestID=\"" + id + u"\"><InvoiceAddRet>" +
+                  maybe(u"TxnID", u"T-" + id) + maybe(u"TxnDate", u"2026-11-25") + lines() +
+                  u"</InvoiceAddRet></InvoiceAddRs>";
+      }
+    }
+    return text + u"</QBXMLMsgsRs></QBXML>";
+  }
+
+ private:
+  Text header() {
+    return maybe(u"ListID", u"80-1") + maybe(u"TimeCreated", u"2026-11-25T08:00:00") +
+           maybe(u"TimeModified", u"2026-11-25T08:00:00") + maybe(u"EditSequence", u"7") +
+           maybe(u"Name") + maybe(u"FullName") + maybe(u"IsActive", u"true") +
+           maybe(u"Sublevel", u"0");
+  }
+  Text lines() {
+    Text text;
+    for (auto count = random_() % 4; count > 0; --count) {
+      text += u"<InvoiceLineRet>" + maybe(u"TxnLineID", u"L") +
+              maybe(u"ItemRef", maybe(u"ListID", u"I-1") + maybe(u"FullName")) + maybe(u"Desc") +
+              maybe(u"Quantity", u"2") + maybe(u"Amount", u"3.00") + u"</InvoiceLineRet>";
+    }
+    return text;
+  }
+  // The element with a value, empty, self-closed (with or without the blank), with an
+  // attribute, or absent.
+  Text maybe(const Text& tag, const Text& value = u"v") {
+    switch (random_() % 7) {
+      case 0:
+        return u"<" + tag + u"></" + tag + u">";
+      case 1:
+        return u"<" + tag + u"/>";
+      case 2:
+        return u"<" + tag + u" />";
+      case 3:
+        return u"<" + tag + u" a=\"1\">" + value + u"</" + tag + u">";
+      case 4:
+        return {};
+      default:
+        return u"<" + tag + u">" + value + u"</" + tag + u">";
+    }
+  }
+
+  std::mt19937 random_;
+};
+
+// What a read left behind: its result and the record's values, or the error it raised.
+template <class Record, class Value>
+Text readWith(const Value& value, int32_t start) {
+  Record record;
+  try {
+    Text seen = asciiText(std::to_string(record.ParseRs(value, start)));
+    for (size_t i = 0; i < record.fieldSpecs().size(); ++i) seen += u"|" + record.fieldValue(i);
+    if constexpr (std::is_same_v<Record, DroCustomer>) seen += record.PrintOut();
+    if constexpr (std::is_same_v<Record, DroInvoice>) {
+      for (int32_t i = 1; i <= record.InvoiceLines()->Count(); ++i) {
+        seen += record.InvoiceLines()->Item(Variant(i))->PrintOut();
+      }
+    }
+    return seen;
+  } catch (const ComError& error) {
+    return u"error " + error.description();
+  }
+}
+
+TEST(IndexedResponseTest, ReadsExactlyWhatThePlainTextReads) {
+  for (const unsigned seed : {1u, 2u, 3u}) {
+    const Text text = RandomBatch(seed).make(400);
+    ASSERT_GT(text.size(), 20000u);  // long enough for a plain read to index it too
+    const IndexedResponse indexed(text);
+    std::mt19937 random(seed);
+    for (int round = 0; round < 300; ++round) {
+      const auto start = static_cast<int32_t>(random() % (text.size() + 2));
+      ASSERT_EQ((readWith<DroCustomer>(indexed, start)), (readWith<DroCustomer>(text, start)))
+          << seed << " " << start;
+      ASSERT_EQ((readWith<DroAccount>(indexed, start)), (readWith<DroAccount>(text, start)));
+      ASSERT_EQ((readWith<DroInvoice>(indexed, start)), (readWith<DroInvoice>(text, start)));
+    }
+  }
+}
+
+}  // namespace
+}  // namespace droqbxml
