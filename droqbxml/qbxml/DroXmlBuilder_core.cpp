@@ -10,6 +10,7 @@
 
 #include "droqbxml/diagnostics/ErrorNumbers.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
+#include "droqbxml/qbxml/internal/EscapeInto.hpp"
 #include "droqbxml/records/DroAccount.hpp"
 #include "droqbxml/records/DroCustomer.hpp"
 #include "droqbxml/records/DroCustomerCol.hpp"
@@ -52,6 +53,22 @@ void appendOpening(Text& out, const DroXmlElement& elem) {
     out += elem.AttributeValue(i);
     out += u'"';
   }
+}
+
+// After "<Name" and the attributes: " />" for an empty value, else ">", the value,
+// "</Name>"; then the line end.
+template <class WriteValue>
+void appendElementRest(Text& out, TextView name, bool empty, WriteValue writeValue) {
+  if (empty) {
+    out += u" />";
+  } else {
+    out += u'>';
+    writeValue(out);
+    out += u"</";
+    out += name;
+    out += u'>';
+  }
+  out += kLineEnd;
 }
 
 }  // namespace
@@ -124,13 +141,13 @@ void DroXmlBuilder::AddHeaders() {
                u"Could not assign XML header information because the DroXmlProcessor object "
                u"has not been initialized properly prior to attempted use.");
   }
-  Text header(kHeader);
-  header.append(static_cast<size_t>(indentLevel_), u'\t');
-  header += u"<QBXMLMsgsRq onError=\"";
-  header += onError_;
-  header += u"\">";
-  header += kLineEnd;
-  document_ = std::move(header);
+  // Written over the last document, whose room the new one reuses.
+  document_.assign(kHeader);
+  document_.append(static_cast<size_t>(indentLevel_), u'\t');
+  document_ += u"<QBXMLMsgsRq onError=\"";
+  document_ += onError_;
+  document_ += u"\">";
+  document_ += kLineEnd;
   indentUp();
 }
 
@@ -146,23 +163,22 @@ void DroXmlBuilder::AddElementAggregateSimple(const Text& sNameA) {
 }
 
 void DroXmlBuilder::AddElementSimple(const Text& sNameA, const Text& sValueA) {
-  AddElement(CreateElement(sNameA, XmlEscapeX(sValueA)));
+  // What AddElement(CreateElement(sNameA, XmlEscapeX(sValueA))) writes (the name trimmed,
+  // no attributes), with the value escaped straight into the document.
+  const TextView name = trimView(sNameA);
+  appendIndent();
+  document_ += u'<';
+  document_ += name;
+  appendElementRest(document_, name, sValueA.empty(),
+                    [&](Text& out) { internal::escapeInto(out, sValueA, false); });
 }
 
 void DroXmlBuilder::AddElement(const Ref<DroXmlElement>& Elem) {
   requireElement(Elem);
   appendIndent();
   appendOpening(document_, *Elem);
-  if (Elem->Value().empty()) {
-    document_ += u" />";
-  } else {
-    document_ += u'>';
-    document_ += Elem->Value();
-    document_ += u"</";
-    document_ += Elem->Name();
-    document_ += u'>';
-  }
-  document_ += kLineEnd;
+  appendElementRest(document_, Elem->Name(), Elem->Value().empty(),
+                    [&](Text& out) { out += Elem->Value(); });
 }
 
 void DroXmlBuilder::AddAggregateBegin(const Ref<DroXmlElement>& Elem) {

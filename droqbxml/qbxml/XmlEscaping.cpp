@@ -5,14 +5,22 @@
 // "&". Replacing only the reference at hand gives the same text as long as no replacement
 // character can take part in forming another reference ("&", "#", digits, ";"), because
 // every later copy of the reference is then met and replaced by the scan itself. The scan
-// therefore runs in one pass and falls back to the literal whole-text replacement only
-// when such a character appears.
+// therefore runs in one pass, together with the five entities' replacement that comes
+// before it, and falls back to the literal whole-text replacement only when such a
+// character appears.
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 #include "droqbxml/component/basGlobals.hpp"
+#include "droqbxml/qbxml/internal/EscapeInto.hpp"
 #include "droqbxml/runtime/Codepage.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Numbers.hpp"
@@ -78,8 +86,52 @@ char16_t* writeEscaped(char16_t* out, char16_t c, bool useUnicode) {
 }
 
 // Printable ASCII other than the five characters that have entities: written as it is.
-bool isPlain(char16_t c) {
+[[maybe_unused]] bool isPlain(char16_t c) {
   return c >= 0x20 && c <= 0x7E && c != u'\'' && c != u'"' && c != u'<' && c != u'>' && c != u'&';
+}
+
+// Whether the eight code units at p are all plain.
+bool eightPlain(const char16_t* p) {
+#if defined(__SSE2__)
+  const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+  // Signed comparisons: code units from 0x8000 compare below 0x20, so they count as not
+  // plain, as they are.
+  __m128i other = _mm_or_si128(_mm_cmplt_epi16(units, _mm_set1_epi16(0x20)),
+                               _mm_cmpgt_epi16(units, _mm_set1_epi16(0x7E)));
+  for (const char16_t special : {u'\'', u'"', u'<', u'>', u'&'}) {
+    other =
+        _mm_or_si128(other, _mm_cmpeq_epi16(units, _mm_set1_epi16(static_cast<int16_t>(special))));
+  }
+  return _mm_movemask_epi8(other) == 0;
+#else
+  for (size_t k = 0; k < 8; ++k) {
+    if (!isPlain(p[k])) return false;
+  }
+  return true;
+#endif
+}
+
+constexpr size_t kLongestEscape = 8;  // "&#65535;"
+
+// What each code unit below 256 is written as, in either mode.
+struct LowEscape {
+  char16_t units[kLongestEscape];
+  size_t length;
+};
+
+const std::array<LowEscape, 256>& lowEscapes(bool useUnicode) {
+  const auto make = [](bool unicode) {
+    std::array<LowEscape, 256> table{};
+    for (size_t c = 0; c < table.size(); ++c) {
+      char16_t* units = table[c].units;
+      table[c].length =
+          static_cast<size_t>(writeEscaped(units, static_cast<char16_t>(c), unicode) - units);
+    }
+    return table;
+  };
+  static const std::array<LowEscape, 256> unicode = make(true);
+  static const std::array<LowEscape, 256> ansi = make(false);
+  return useUnicode ? unicode : ansi;
 }
 
 Text replaceAll(const Text& text, TextView what, TextView with) {
@@ -131,25 +183,55 @@ Text unescapeReferencesLiterally(Text text, bool useUnicode) {
   return text;
 }
 
-// One pass; nullopt-like false when a replacement could form further references.
-bool unescapeReferencesInOnePass(const Text& text, bool useUnicode, Text& out) {
-  out.clear();
-  out.reserve(text.size());
-  size_t from = 0;
-  for (size_t at = text.find(u"&#"); at != Text::npos; at = text.find(u"&#", from)) {
-    const Reference ref = readReference(text, at);
-    if (!ref.terminated) {
-      out.append(text, from, at + 1 - from);  // keep the "&", go on after it
-      from = at + 1;
-      continue;
-    }
-    const char16_t replacement = referenceCharacter(ref.digits, useUnicode);
-    if (formsReferences(replacement)) return false;
-    out.append(text, from, at - from);
-    out.push_back(replacement);
-    from = at + 3 + ref.digits.size();
+// The first '&' at or after `from`, eight code units at a time.
+size_t findAmpersand(TextView text, size_t from) {
+#if defined(__SSE2__)
+  const __m128i amp = _mm_set1_epi16(u'&');
+  for (; from + 8 <= text.size(); from += 8) {
+    const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + from));
+    const int mask = _mm_movemask_epi8(_mm_cmpeq_epi16(units, amp));
+    if (mask != 0)
+      return from + static_cast<size_t>(__builtin_ctz(static_cast<unsigned>(mask))) / 2;
   }
-  out.append(text, from, Text::npos);
+#endif
+  return text.find(u'&', from);
+}
+
+// The entity among the five that `rest` starts with: its length (0 for none) and character.
+size_t entityAt(TextView rest, char16_t& character) {
+  for (const auto& row : basGlobals::EntityTable) {
+    if (rest.starts_with(row.entity)) {
+      character = row.character;
+      return row.entity.size();
+    }
+  }
+  return 0;
+}
+
+// replaceEntities and then the reference scan, in a single pass over s: an "&" of the
+// entity-replaced text is an "&" that starts no entity or one from "&amp;", and what
+// follows it there ("#", digits, ";") stands in s as it is, since no entity gives any of
+// them. False where the two-step form would fall back to the literal procedure.
+bool unescapeInOnePass(const Text& s, bool useUnicode, Text& out) {
+  out.clear();
+  out.reserve(s.size());
+  size_t from = 0;
+  for (size_t at = findAmpersand(s, 0); at != TextView::npos; at = findAmpersand(s, from)) {
+    char16_t character = u'&';
+    const size_t entity = entityAt(TextView(s).substr(at), character);
+    out.append(s, from, at - from);
+    from = at + (entity == 0 ? 1 : entity);
+    if (character == u'&' && from < s.size() && s[from] == u'#') {
+      const Reference ref = readReference(s, from - 1);
+      if (ref.terminated) {
+        character = referenceCharacter(ref.digits, useUnicode);
+        if (formsReferences(character)) return false;
+        from += ref.digits.size() + 2;
+      }
+    }
+    out.push_back(character);
+  }
+  out.append(s, from, Text::npos);
   return true;
 }
 
@@ -161,29 +243,57 @@ Text XMLEscapeChar(TextView c, bool useUnicode) {
   return Text(escaped, writeEscaped(escaped, c[0], useUnicode));
 }
 
-Text XMLEscapeString(TextView s, bool useUnicode) {
-  // One pass writing through a pointer into room made ahead (a character takes at most
-  // kLongestEscape units); the room grows when the rest might not fit.
-  constexpr size_t kLongestEscape = 8;  // "&#65535;"
+void internal::escapeInto(Text& out, TextView s, bool useUnicode) {
+  // Two passes over the text: the exact length, then the writing into that much room at
+  // the end of out. Blocks of eight printable ASCII code units are copied whole; in other
+  // blocks each code unit below 256 is copied from a table (itself, its entity or its
+  // reference), the rest are worked out one by one.
+  const auto& table = lowEscapes(useUnicode);
   const size_t n = s.size();
-  Text out(n + n / 4 + kLongestEscape, u'\0');
-  char16_t* dst = out.data();
-  char16_t* end = dst + out.size();
-  for (size_t i = 0; i < n; ++i) {
-    if (static_cast<size_t>(end - dst) < kLongestEscape) {
-      const size_t written = static_cast<size_t>(dst - out.data());
-      out.resize(out.size() + (n - i) + (n - i) / 4 + kLongestEscape);
-      dst = out.data() + written;
-      end = out.data() + out.size();
+  const char16_t* in = s.data();
+  const auto plainBlock = [&](size_t i) { return i + 8 <= n && eightPlain(in + i); };
+  size_t length = 0;
+  char16_t scratch[kLongestEscape];
+  for (size_t i = 0; i < n; i += 8) {
+    if (plainBlock(i)) {
+      length += 8;
+      continue;
     }
-    const char16_t c = s[i];
-    if (isPlain(c)) {
-      *dst++ = c;
-    } else {
-      dst = writeEscaped(dst, c, useUnicode);
+    for (size_t k = i; k < i + 8 && k < n; ++k) {
+      const char16_t c = in[k];
+      length += c < table.size()
+                    ? table[c].length
+                    : static_cast<size_t>(writeEscaped(scratch, c, useUnicode) - scratch);
     }
   }
-  out.resize(static_cast<size_t>(dst - out.data()));
+  const size_t start = out.size();
+  out.resize(start + length);
+  char16_t* dst = out.data() + start;
+  char16_t* const end = dst + length;
+  for (size_t i = 0; i < n; i += 8) {
+    if (plainBlock(i)) {
+      std::char_traits<char16_t>::copy(dst, in + i, 8);
+      dst += 8;
+      continue;
+    }
+    for (size_t k = i; k < i + 8 && k < n; ++k) {
+      const char16_t c = in[k];
+      if (c >= table.size()) {
+        dst = writeEscaped(dst, c, useUnicode);
+      } else if (end - dst >= static_cast<ptrdiff_t>(kLongestEscape)) {
+        std::char_traits<char16_t>::copy(dst, table[c].units, kLongestEscape);  // all eight
+        dst += table[c].length;
+      } else {
+        dst = std::char_traits<char16_t>::copy(dst, table[c].units, table[c].length) +
+              table[c].length;
+      }
+    }
+  }
+}
+
+Text XMLEscapeString(TextView s, bool useUnicode) {
+  Text out;
+  internal::escapeInto(out, s, useUnicode);
   return out;
 }
 
@@ -246,11 +356,9 @@ Text replaceEntities(const Text& s) {
 }
 
 Text XMLUnEscapeText(const Text& s, bool useUnicode) {
-  Text text = replaceEntities(s);
-  if (text.find(u"&#") == Text::npos) return text;
   Text out;
-  if (unescapeReferencesInOnePass(text, useUnicode, out)) return out;
-  return unescapeReferencesLiterally(std::move(text), useUnicode);
+  if (unescapeInOnePass(s, useUnicode, out)) return out;
+  return unescapeReferencesLiterally(replaceEntities(s), useUnicode);
 }
 
 }  // namespace droqbxml

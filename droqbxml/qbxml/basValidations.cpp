@@ -207,7 +207,7 @@ Text CheckDATETYPE(const Text& value) {
   return Text(mid(value, 1, 10));
 }
 
-Text CheckDATETIMETYPE(const Text& value) { return value; }
+Text CheckDATETIMETYPE(Text value) { return value; }
 
 Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
                   const int32_t& lower) {
@@ -236,18 +236,19 @@ Text CheckQUANTYPE(const Text& value) {
   return formatFixed(*quantity, 5);
 }
 
-Text CheckSTRTYPE(const Text& value, const int16_t& maxLen, const bool& truncate) {
+Text CheckSTRTYPE(Text value, const int16_t& maxLen, const bool& truncate) {
   if (value.empty()) return {};
   if (maxLen >= 1 && value.size() > static_cast<size_t>(maxLen)) {
     if (!truncate) refuse(kStringRefusal, value);
-    return value.substr(0, static_cast<size_t>(maxLen));
+    value.resize(static_cast<size_t>(maxLen));
+    return value;
   }
   return value;
 }
 
-Text CheckIDTYPE(const Text& value) {
+Text CheckIDTYPE(Text value) {
   bool truncate = false;
-  return CheckSTRTYPE(value, 0, truncate);
+  return CheckSTRTYPE(std::move(value), 0, truncate);
 }
 
 Text CheckPERCENTTYPE(const Text& value) {

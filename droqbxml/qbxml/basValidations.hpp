@@ -45,7 +45,7 @@ Text CheckBOOLTYPE(const Text& value);
 Text CheckDATETYPE(const Text& value);
 
 // Accepts every value unchanged.
-Text CheckDATETIMETYPE(const Text& value);
+Text CheckDATETIMETYPE(Text value);
 
 // A 32-bit integer in decimal ("007" gives "7"); text that does not convert is the
 // runtime's 13, or 6 beyond the 32-bit range. Mode 1 refuses a value text longer than
@@ -68,10 +68,10 @@ Text CheckQUANTYPE(const Text& value);
 
 // A text of at most `maxLen` characters (no limit when maxLen < 1). A longer value is cut
 // to maxLen characters when `truncate` is true and refused (TYPE_STRING) when it is false.
-Text CheckSTRTYPE(const Text& value, const int16_t& maxLen, const bool& truncate);
+Text CheckSTRTYPE(Text value, const int16_t& maxLen, const bool& truncate);
 
 // Accepts every value unchanged (a text without length limit).
-Text CheckIDTYPE(const Text& value);
+Text CheckIDTYPE(Text value);
 
 // The number re-written in its shortest decimal form ("7.50" gives "7.5"); the runtime's
 // 13 for non-numeric text, 6 beyond the range of a double.

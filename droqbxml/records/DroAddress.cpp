@@ -40,7 +40,9 @@ void DroAddress::CopyAddress(const Ref<DroAddress>& oAddress) {
 void DroAddress::ParseRs(const Text& AddressName, const Text& Value, int32_t& StartPoint,
                          int32_t& EndPoint) {
   if (StartPoint == 0) StartPoint = EndPoint == 0 ? 1 : EndPoint;
-  StartPoint = basCommonProcs::findInResponse(StartPoint, Value, u"<" + AddressName + u">");
+  thread_local Text tag;  // "<AddressName>", made without allocating on most calls
+  tag.assign(u"<").append(AddressName).push_back(u'>');
+  StartPoint = basCommonProcs::findInResponse(StartPoint, Value, tag);
   if (StartPoint == 0) return;
   FieldReader<DroAddress>(*this, Value, StartPoint, EndPoint)
       .optional<u"Addr1", u"Addr2", u"Addr3", u"City", u"State", u"PostalCode", u"Country">();

@@ -22,8 +22,10 @@ void DroObjRef::fieldStored(size_t) { hasData_ = !ListID().empty() || !FullName(
 
 void DroObjRef::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint,
                         int32_t& EndPoint, bool Required, const Text& Parent) {
-  if (basCommonProcs::findInResponse(EndPoint, Value, u"<" + RefName + u">") == 0) return;
-  FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent + u"<" + RefName + u">");
+  thread_local Text tag;  // "<RefName>", made without allocating on most calls
+  tag.assign(u"<").append(RefName).push_back(u'>');
+  if (basCommonProcs::findInResponse(EndPoint, Value, tag) == 0) return;
+  FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent + tag);
   reader.read(index<u"ListID">(), Required);
   reader.read(index<u"FullName">(), Required);
 }

@@ -8,15 +8,15 @@
 namespace droqbxml {
 namespace {
 
-Text checked(const FieldSpec& row, const Text& value) {
+Text checked(const FieldSpec& row, Text value) {
   using namespace basValidations;
   switch (row.check) {
     case Check::None:
       return value;
     case Check::Str:
-      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), false);
+      return CheckSTRTYPE(std::move(value), static_cast<int16_t>(row.arg), false);
     case Check::StrCut:
-      return CheckSTRTYPE(value, static_cast<int16_t>(row.arg), true);
+      return CheckSTRTYPE(std::move(value), static_cast<int16_t>(row.arg), true);
     case Check::Int:
       return CheckINTTYPE(value, row.arg, 0, 0);
     case Check::IntLength:
@@ -28,7 +28,7 @@ Text checked(const FieldSpec& row, const Text& value) {
     case Check::Date:
       return CheckDATETYPE(value);
     case Check::DateTime:
-      return CheckDATETIMETYPE(value);
+      return CheckDATETIMETYPE(std::move(value));
     case Check::Amt:
       return CheckAMTTYPE(value);
     case Check::Price:
@@ -38,7 +38,7 @@ Text checked(const FieldSpec& row, const Text& value) {
     case Check::Percent:
       return CheckPERCENTTYPE(value);
     case Check::Id:
-      return CheckIDTYPE(value);
+      return CheckIDTYPE(std::move(value));
     case Check::JobStatus:
       return CheckJobStatus(value);
     case Check::AccountType:
@@ -72,18 +72,21 @@ Text Record::fieldValueUnescaped(size_t index) const {
   return XMLUnEscapeText(values_[index], false);
 }
 
-void Record::setFieldValue(size_t index, const Text& value) {
+void Record::setFieldValue(size_t index, Text value) {
   const FieldSpec& row = fields_[index];
   if (row.rule == Rule::KeepsStoredValue) {
     fieldStored(index);
     return;
   }
-  const Text trimmed = row.trim == Trim::Spaces ? trim(value) : value;
-  const Text result = checked(row, trimmed);
+  if (row.trim == Trim::Spaces) {
+    const TextView kept = trimView(value);
+    if (kept.size() != value.size()) value = Text(kept);
+  }
+  Text result = checked(row, std::move(value));
   if (row.rule == Rule::Specific) {
     applyRule(index, result);
   } else {
-    values_[index] = result;
+    values_[index] = std::move(result);
   }
   fieldStored(index);
 }

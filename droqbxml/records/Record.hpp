@@ -135,7 +135,7 @@ class Record : public Object {
   const Text& fieldValue(size_t index) const { return values_[index]; }
   Text fieldValueUnescaped(size_t index) const;
   // Trim, check and store by the field's row; rules and the record's hooks apply.
-  void setFieldValue(size_t index, const Text& value);
+  void setFieldValue(size_t index, Text value);
 
   std::span<const FieldSpec> fieldSpecs() const noexcept { return fields_; }
 

@@ -18,16 +18,20 @@ constexpr size_t kSelfClosingWindow = 100;
 }
 
 // The first "<N/>", else the first "<N />", lying wholly inside the window at the cursor:
-// its 0-based position.
-size_t selfClosingAt(const Text& value, size_t cursor, TextView name) {
+// its 0-based position. `open` is "<N". Found from the window's "/>"s, which responses
+// seldom hold.
+size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
   const TextView window = TextView(value).substr(cursor, kSelfClosingWindow);
   size_t spaced = Text::npos;
-  for (size_t at = window.find(u'<'); at != TextView::npos; at = window.find(u'<', at + 1)) {
-    const TextView rest = window.substr(at + 1);
-    if (!rest.starts_with(name)) continue;
-    const TextView after = rest.substr(name.size());
-    if (after.starts_with(u"/>")) return cursor + at;
-    if (spaced == Text::npos && after.starts_with(u" />")) spaced = cursor + at;
+  for (size_t close = internal::findForward(window, u"/>", 0); close != TextView::npos;
+       close = internal::findForward(window, u"/>", close + 1)) {
+    if (close >= open.size() && window.substr(close - open.size(), open.size()) == open) {
+      return cursor + close - open.size();
+    }
+    if (spaced == Text::npos && close > open.size() && window[close - 1] == u' ' &&
+        window.substr(close - 1 - open.size(), open.size()) == open) {
+      spaced = cursor + close - 1 - open.size();
+    }
   }
   return spaced;
 }
@@ -46,8 +50,12 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
+  // "</N>" built once in a buffer of the thread; "<N>" is the same text without the slash.
+  thread_local Text startTag;
+  thread_local Text endTag;
+  startTag.assign(u"<").append(ElementName).push_back(u'>');
   if (from <= Value.size()) {
-    const size_t at = selfClosingAt(Value, from, ElementName);
+    const size_t at = selfClosingAt(Value, from, TextView(startTag).substr(0, startTag.size() - 1));
     if (at != Text::npos) {
       // Empty by its form: the required test is not made.
       StartPoint = static_cast<int32_t>(at + 1);
@@ -56,10 +64,6 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
     }
   }
   Text result;
-  // "</N>" built once in a buffer of the thread; "<N>" is the same text without the slash.
-  thread_local Text startTag;
-  thread_local Text endTag;
-  startTag.assign(u"<").append(ElementName).push_back(u'>');
   endTag.assign(u"</").append(ElementName).push_back(u'>');
   const int32_t start = findInResponse(cursor, Value, startTag);
   if (start > 0) {

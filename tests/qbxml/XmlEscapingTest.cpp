@@ -1,12 +1,14 @@
 // The escaper and unescaper, directly and through clsXmlStringEscaping by name, and the
-// fast escaper against a plain reference.
+// fast ones against plain references.
 #include <gtest/gtest.h>
 
 #include <random>
 
 #include "droqbxml/component/ClassFactory.hpp"
+#include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 #include "droqbxml/runtime/Codepage.hpp"
+#include "droqbxml/runtime/Numbers.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -143,6 +145,57 @@ TEST(XmlEscapingTest, FastEscaperAgreesWithTheReference) {
   }
   const Text references(100000, char16_t{0xFFFF});
   EXPECT_EQ(XMLEscapeString(references, true), referenceEscape(references, true));
+}
+
+// The unescaper as first written: each entity row replaced in the whole text, then each
+// reference met replaced in the whole text. The reference for the one-pass unescaper.
+Text replacedEverywhere(const Text& text, TextView what, TextView with) {
+  Text out;
+  size_t from = 0;
+  for (size_t at = text.find(what); at != Text::npos; at = text.find(what, from)) {
+    out.append(text, from, at - from).append(with);
+    from = at + what.size();
+  }
+  return out.append(text, from);
+}
+
+Text referenceUnescape(Text text) {
+  for (const auto& row : basGlobals::EntityTable) {
+    text = replacedEverywhere(text, row.entity, TextView(&row.character, 1));
+  }
+  for (size_t at = text.find(u"&#"); at != Text::npos; at = text.find(u"&#", at + 1)) {
+    const size_t end = text.find_first_not_of(u"0123456789", at + 2);
+    if (end == Text::npos || text[end] != u';') continue;
+    const char16_t c = ansiChar(textToLong(text.substr(at + 2, end - at - 2)));
+    text = replacedEverywhere(text, text.substr(at, end + 1 - at), TextView(&c, 1));
+  }
+  return text;
+}
+
+// Texts dense in entities, references and their pieces; the errors are the same too.
+TEST(XmlEscapingTest, OnePassUnescaperAgreesWithTheReference) {
+  std::mt19937 random(20261126);
+  const TextView pieces[] = {u"&", u"#",     u";",      u"6",     u"5",     u"3",
+                             u"8", u"amp;",  u"lt;",    u"&#38;", u"&#65;", u"&#59;",
+                             u"x", u"&amp;", u"\u00e9", u"&#35;", u"&#"};
+  for (int round = 0; round < 20000; ++round) {
+    Text text;
+    for (auto count = random() % 12; count > 0; --count)
+      text += pieces[random() % std::size(pieces)];
+    Text expected;
+    try {
+      expected = referenceUnescape(text);
+    } catch (const ComError& error) {
+      expected = u"error " + asciiText(std::to_string(error.number()));
+    }
+    Text actual;
+    try {
+      actual = unescape(text);
+    } catch (const ComError& error) {
+      actual = u"error " + asciiText(std::to_string(error.number()));
+    }
+    ASSERT_EQ(actual, expected) << toUtf8(text);
+  }
 }
 
 TEST(XmlEscapingTest, ReachableByNameThroughTheEscapingClass) {

@@ -4,6 +4,7 @@
 #include "droqbxml/records/internal/TagIndex.hpp"
 
 #include <algorithm>
+#include <cstring>
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
@@ -15,6 +16,22 @@ namespace {
 bool startsName(char16_t first) { return first != u'/' && first != u'?' && first != u'!'; }
 // A name ending so is an attribute's value or a self-closed tag's slash.
 bool endsName(char16_t last) { return last != u'"' && last != u'\'' && last != u'/'; }
+
+// Whether the n code units at a and b are the same, compared eight bytes at a time (names
+// are short: a call to memcmp would cost more than the comparison).
+bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
+  for (; n >= 4; n -= 4, a += 4, b += 4) {
+    uint64_t x;
+    uint64_t y;
+    std::memcpy(&x, a, 8);
+    std::memcpy(&y, b, 8);
+    if (x != y) return false;
+  }
+  for (; n > 0; --n) {
+    if (*a++ != *b++) return false;
+  }
+  return true;
+}
 
 // Calls lt(p) for each '<' and gt(p) for each '>' of text, in the text's order.
 template <class Lt, class Gt>
@@ -50,8 +67,11 @@ void forEachBracket(TextView text, Lt lt, Gt gt) {
 bool TagIndex::covers(TextView pattern) {
   if (pattern.size() < 3 || pattern.front() != u'<' || pattern.back() != u'>') return false;
   const TextView name = pattern.substr(1, pattern.size() - 2);
-  return startsName(name.front()) && endsName(name.back()) &&
-         name.find_first_of(u"<>") == TextView::npos;
+  if (!startsName(name.front()) || !endsName(name.back())) return false;
+  for (const char16_t c : name) {
+    if (c == u'<' || c == u'>') return false;
+  }
+  return true;
 }
 
 size_t TagIndex::slotOf(size_t length, char16_t first, char16_t last) const {
@@ -68,7 +88,9 @@ uint32_t TagIndex::groupOf(size_t at, size_t length) {
     slot = Slot{static_cast<uint32_t>(at), static_cast<uint32_t>(length), groups_};
     return groups_++;
   }
-  if (slot.length == length && text_.substr(slot.first, length) == name) return slot.group;
+  if (slot.length == length && sameUnits(text_.data() + slot.first, name.data(), length)) {
+    return slot.group;
+  }
   const auto [known, added] = others_.try_emplace(name, groups_);
   if (added) ++groups_;
   return known->second;
@@ -90,33 +112,40 @@ TagIndex::TagIndex(TextView text) : text_(text) {
   // A start tag's name ends at the first '>' after its '<', so its group is known when that
   // '>' is reached; '<'s still waiting for theirs are pending (more than one only in text
   // that is not XML).
-  std::vector<uint32_t> positions;
-  std::vector<uint32_t> groups;
-  std::vector<uint32_t> pending;
-  positions.reserve(text.size() / 32);
-  groups.reserve(text.size() / 32);
+  struct Tag {
+    uint32_t at;
+    uint32_t group;
+  };
+  std::vector<Tag> tags;
+  tags.reserve(text.size() / 32);
+  uint32_t pending = UINT32_MAX;  // the '<' waiting for its '>'
+  std::vector<uint32_t> morePending;
   const char16_t* data = text.data();
+  const auto close = [&](size_t p, size_t g) {
+    if (g - p >= 2 && endsName(data[g - 1])) {
+      tags.push_back({static_cast<uint32_t>(p), groupOf(p + 1, g - p - 1)});
+    }
+  };
   forEachBracket(
       text,
       [&](size_t p) {
         if (p + 1 < text.size() && startsName(data[p + 1])) {
-          pending.push_back(static_cast<uint32_t>(p));
+          if (pending != UINT32_MAX) morePending.push_back(pending);
+          pending = static_cast<uint32_t>(p);
         }
       },
       [&](size_t g) {
-        for (const uint32_t p : pending) {
-          if (g - p < 2 || !endsName(data[g - 1])) continue;
-          positions.push_back(p);
-          groups.push_back(groupOf(p + 1, g - p - 1));
-        }
-        pending.clear();
+        for (const uint32_t p : morePending) close(p, g);
+        morePending.clear();
+        if (pending != UINT32_MAX) close(pending, g);
+        pending = UINT32_MAX;
       });
   starts_.assign(size_t{groups_} + 1, 0);
-  for (const uint32_t group : groups) ++starts_[group + 1];
+  for (const Tag& tag : tags) ++starts_[tag.group + 1];
   for (size_t g = 1; g < starts_.size(); ++g) starts_[g] += starts_[g - 1];
-  at_.resize(positions.size());
+  at_.resize(tags.size());
   std::vector<uint32_t> next(starts_.begin(), starts_.end() - 1);
-  for (size_t i = 0; i < positions.size(); ++i) at_[next[groups[i]]++] = positions[i];
+  for (const Tag& tag : tags) at_[next[tag.group]++] = tag.at;
 }
 
 size_t TagIndex::find(TextView pattern, size_t from) const {

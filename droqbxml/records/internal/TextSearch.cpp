@@ -62,8 +62,9 @@ thread_local SearchScope* openScope = nullptr;
 
 // Most searches of a read end close to where they start: this many code units from the
 // start are searched directly, before the memory or the index is consulted.
-constexpr size_t kNear = 256;
-// Shorter texts are never indexed: searching them to the end costs less.
+constexpr size_t kNear = 64;
+// Shorter texts are never indexed: searching them to the end costs less. A tag not found
+// within this many code units of where its search starts has the text indexed.
 constexpr size_t kIndexedSize = 8192;
 
 }  // namespace
@@ -89,20 +90,23 @@ size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
 
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
-  const size_t nearEnd = std::min(text.size(), from + kNear);
-  size_t at = findForward(text.substr(0, nearEnd), pattern, from);
-  if (at != TextView::npos || nearEnd == text.size()) return at;
-  if (!answers_.empty() && remembered(pattern, from, at)) return at;
-  const bool isTag = TagIndex::covers(pattern);
-  if (isTag && index_ == nullptr && scanned_ > 2 * text.size() && text.size() >= kIndexedSize &&
-      text.size() <= UINT32_MAX) {
-    ownIndex_ = std::make_unique<TagIndex>(text);
-    index_ = ownIndex_.get();
-    answers_.clear();  // the index answers the tags now; the rest are searched again once
+  size_t end = std::min(text.size(), from + kNear);
+  size_t at = findForward(text.substr(0, end), pattern, from);
+  if (at != TextView::npos || end == text.size()) return at;
+  if (TagIndex::covers(pattern)) {
+    if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
+      // A tag not found nearby: a little further, else (it is far or absent) index the
+      // text for this search and the rest of the read.
+      end = std::min(text.size(), from + kIndexedSize);
+      at = findForward(text.substr(0, end), pattern, from);
+      if (at != TextView::npos || end == text.size()) return at;
+      ownIndex_ = std::make_unique<TagIndex>(text);
+      index_ = ownIndex_.get();
+    }
+    if (index_ != nullptr) return index_->find(pattern, from);
   }
-  if (isTag && index_ != nullptr) return index_->find(pattern, from);
+  if (!answers_.empty() && remembered(pattern, from, at)) return at;
   at = findForward(text, pattern, from);
-  scanned_ += (at == TextView::npos ? text.size() : at) - from;
   remember(pattern, from, at);
   return at;
 }

@@ -7,8 +7,8 @@
 // Within one read (a SearchScope, open while one top-level ParseRs runs on one text that
 // nothing can change meanwhile) more is allowed: a search that runs far is remembered per
 // pattern, so an element absent from the rest of the text is searched to the end once, not
-// once per line of a long transaction; and once the searches of a read have gone over the
-// text twice, the read indexes its start tags (TagIndex) and looks tags up there. A read
+// once per line of a long transaction; and the first start tag searched for far into a long
+// text has the read index the text's start tags (TagIndex) and look tags up there. A read
 // over an IndexedResponse uses the response's own index from the start.
 #ifndef DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 #define DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
@@ -58,7 +58,6 @@ class SearchScope {
   const Text* text_ = nullptr;
   const TagIndex* index_ = nullptr;
   std::unique_ptr<TagIndex> ownIndex_;
-  size_t scanned_ = 0;  // code units gone over by searches that ran far
   std::unordered_map<Text, Answer, Hash, std::equal_to<>> answers_;
 };
 
