@@ -121,6 +121,38 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   }
 }
 
+// The self-closed forms as first found, each '<' of the window in turn: the reference for
+// the search from the window's "/>"s.
+int32_t referenceSelfClosedStart(const Text& text, const Text& name, int32_t cursor) {
+  const TextView window = TextView(text).substr(static_cast<size_t>(cursor - 1), 100);
+  size_t spaced = Text::npos;
+  for (size_t at = window.find(u'<'); at != TextView::npos; at = window.find(u'<', at + 1)) {
+    const TextView rest = window.substr(at + 1);
+    if (!rest.starts_with(name)) continue;
+    if (rest.substr(name.size()).starts_with(u"/>")) return static_cast<int32_t>(cursor + at);
+    if (spaced == Text::npos && rest.substr(name.size()).starts_with(u" />")) spaced = at;
+  }
+  return spaced == Text::npos ? 0 : static_cast<int32_t>(cursor + spaced);
+}
+
+TEST(basCommonProcsTest, SelfClosedFormsAreFoundAsEachLessThanSignWouldFindThem) {
+  std::mt19937 random(11);
+  const TextView pieces[] = {u"<A/>", u"<A />", u"<AB/>", u"<A>", u"</A>", u"x",
+                             u" ",    u"/>",    u"<",     u"A",   u"<A",   u"<A  />"};
+  for (int round = 0; round < 5000; ++round) {
+    Text text;
+    for (auto count = random() % 40; count > 0; --count)
+      text += pieces[random() % std::size(pieces)];
+    const auto cursor = static_cast<int32_t>(1 + random() % (text.size() + 1));
+    const int32_t expected = referenceSelfClosedStart(text, u"A", cursor);
+    const Scan found = scan(text, u"A", cursor);
+    // Else the start tag's search, from the cursor.
+    const size_t open = text.find(u"<A>", static_cast<size_t>(cursor - 1));
+    const int32_t searched = open == Text::npos ? cursor : static_cast<int32_t>(open + 4);
+    ASSERT_EQ(found.start, expected != 0 ? expected : searched) << toUtf8(text) << " " << cursor;
+  }
+}
+
 // A response assigned into the string that held the last one keeps its buffer and, here, its
 // length and both ends: the second read must see the second text.
 TEST(basCommonProcsTest, EachSearchSeesTheTextAsItIsNow) {
