@@ -67,9 +67,8 @@ std::string build(const Ref<Object>& it, const std::string& step) {
   }
   std::string problems;
   for (const simulator::Problem& p : simulator::readRequest(toUtf8(xml)).problems) {
-    problems +=
-        (problems.empty() ? "" : ", ") +
-        shown(Variant(fromUtf8(std::to_string(p.line) + " " + p.element + ": " + p.message)));
+    const std::string problem = std::to_string(p.line) + " " + p.element + ": " + p.message;
+    problems += (problems.empty() ? "" : ", ") + test::quoted(problem, false);
   }
   return problems.empty() ? "none" : problems;
 }
