@@ -128,6 +128,24 @@ std::vector<std::string> problems(const std::string& document) {
   return problems(simulator::readRequest(document));
 }
 
+// The elements of a document read without problems (else the problems), one entry each:
+// "LINE PATH", its attributes as " NAME=VALUE", and a leaf's text after " = "; the version
+// first.
+void elements(const simulator::XmlNode& node, const std::string& parent, Args& out) {
+  std::string entry = std::to_string(node.line) + " " + parent + node.name;
+  for (const auto& [name, value] : node.attributes) entry += " " + name + "=" + value;
+  out.push_back(node.children.empty() ? entry + " = " + node.text : entry);
+  for (const auto& child : node.children) elements(child, parent + node.name + "/", out);
+}
+
+Args elements(const std::string& document) {
+  const simulator::ReadResult read = simulator::readRequest(document);
+  if (!read.document || !read.problems.empty()) return problems(read);
+  Args out{"version " + read.document->qbxmlVersion};
+  elements(read.document->root, "", out);
+  return out;
+}
+
 std::optional<std::string> version(const std::string& document) {
   const simulator::ReadResult read = simulator::readRequest(document);
   if (read.document && read.problems.empty()) return read.document->qbxmlVersion;
@@ -192,12 +210,14 @@ const std::map<std::string, std::function<std::string(const Args&)>>& functions(
       CALL(parseDateTime, parseDateTime(a[0], a[1] == "endOfDay")),
       // The stand-in reading requests: a leaf's value; the problems of a document, of the
       // builder's document with onError a[0] and the lines after it, or of text after it;
-      // the version of a document read without problems.
+      // the version or the elements of a document read without problems.
       CALL(valueProblem, simulator::internal::valueProblem(valueType(a[0]), a[1])),
       CALL(problems, problems(a[0])),
       CALL(builderRequest, problems(builderDocument(a[0], Args(a.begin() + 1, a.end())))),
       CALL(builderRequestThen, problems(builderDocument("stopOnError", {}) + a[0])),
       CALL(version, version(a[0])),
+      CALL(elements, elements(a[0])),
+      CALL(builderElements, elements(builderDocument(a[0], Args(a.begin() + 1, a.end())))),
   };
   return all;
 }

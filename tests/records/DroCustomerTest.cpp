@@ -1,6 +1,6 @@
-// The customer record: reading query and add responses (real ones included), matching
-// responses by request identifier, its dump, and the customer-info exchange of the
-// collection (setter rules: in testdata/records/setters_by_name.txt).
+// The customer record: reading real query and add responses, cut and oversized ones, its
+// dump, an address set to nothing, and the customer-info exchange of the collection (setter
+// rules and more reading: in testdata/records/setters_by_name.txt and parse_by_name.txt).
 #include <gtest/gtest.h>
 
 #include "droqbxml/component/ClassFactory.hpp"
@@ -86,21 +86,16 @@ TEST(DroCustomerTest, RealWarningsAndErrorsReadNothing) {
   EXPECT_EQ(tenth.SalesTaxCodeRef()->FullName(), u"Tax");
 }
 
+// Cut inside a required value: the empty-element error. A 10 MB value: kept where nothing
+// limits it, refused where a limit does. (Cut inside an optional value, finding the own
+// response: testdata/records/parse_by_name.txt.)
 TEST(DroCustomerTest, TruncatedAndOversizedInputEndInTheirErrors) {
-  // Cut inside an optional value: its start tag has no end tag, the cursor drops to 0, and
-  // the next read from it is the runtime's 5. Cut inside a required one: the empty-element
-  // error.
-  const Text full = queryResponse(u"2", customerRet(u"Kim", u"<CompanyName>Acme</CompanyName>"));
-  DroCustomer customer;
-  EXPECT_TRUE(test::raisesRuntime([&] { customer.ParseRs(full.substr(0, full.find(u"Acme") + 4)); },
-                                  RuntimeError::kInvalidProcedureCall));
-  EXPECT_EQ(customer.Sublevel(), u"0");
+  const Text full = queryResponse(u"2", customerRet(u"Kim"));
   EXPECT_TRUE(
       test::raises([&] { DroCustomer().ParseRs(full.substr(0, full.find(u"Kim</Name>") + 3)); },
                    PARING, u"DroQbXml.basCommonProcs.getElementValue",
                    u"The response returned a an empty '<CustomerRet><Name>'.\r\n"
                    u"This element is not allowed to be empty."));
-  // A 10 MB value: kept where nothing limits it, refused where a limit does.
   const Text huge(10'000'000, u'x');
   DroCustomer big;
   big.ParseRs(
@@ -110,39 +105,6 @@ TEST(DroCustomerTest, TruncatedAndOversizedInputEndInTheirErrors) {
   EXPECT_THROW(refused.ParseRs(
                    queryResponse(u"2", customerRet(u"Big", u"<JobDesc>" + huge + u"</JobDesc>"))),
                ComError);
-  // An element carrying an attribute is not found under its name.
-  DroCustomer attributed;
-  attributed.ParseRs(
-      queryResponse(u"2", customerRet(u"A", u"<JobStatus x=\"1\">None</JobStatus>")));
-  EXPECT_EQ(attributed.JobStatus(), u"");
-}
-
-TEST(DroCustomerTest, FindsItsResponseByRequestIdentifier) {
-  const Text batch = u"<QBXMLMsgsRs>" + queryResponse(u"6", customerRet(u"Six")) +
-                     queryResponse(u"7", customerRet(u"Seven")) + u"</QBXMLMsgsRs>";
-  DroCustomer seven;
-  seven.RequestID(u"7");
-  const int32_t cursor = seven.ParseRs(batch);
-  EXPECT_EQ(seven.Name(), u"Seven");
-  DroCustomer eight;
-  eight.RequestID(u"8");
-  EXPECT_GT(eight.ParseRs(batch), 1);
-  EXPECT_EQ(eight.Name(), u"");
-  // Records are read one after another across response elements...
-  DroCustomer first;
-  DroCustomer second;
-  second.ParseRs(batch, first.ParseRs(batch));
-  EXPECT_EQ(first.Name(), u"Six");
-  EXPECT_EQ(second.Name(), u"Seven");
-  // ...but a second customer inside the same response has no requestID after the first
-  // one's cursor, so it is not read.
-  const Text two = queryResponse(u"2", customerRet(u"A") + customerRet(u"B"));
-  DroCustomer a;
-  DroCustomer b;
-  const int32_t afterA = a.ParseRs(two);
-  EXPECT_EQ(b.ParseRs(two, afterA), afterA);
-  EXPECT_EQ(b.Name(), u"");
-  EXPECT_GT(cursor, 0);
 }
 
 TEST(DroCustomerTest, FreshDump) {
