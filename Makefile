@@ -17,10 +17,12 @@ test: setup
 	cmake --build --preset ordinary
 	ctest --preset ordinary
 
+# One table of the speed targets against what this machine measures (some minutes; run it
+# on a quiet machine).
 bench: setup
 	cmake --preset release
 	cmake --build --preset release
-	./build/release/bench/droqbxml_bench
+	python3 scripts/bench-table.py build/release/bench/droqbxml_bench
 
 # The component as a Windows COM server (build/windows/DroQbXml.dll), cross-compiled with
 # mingw-w64; com-test drives it with VBScript and JScript under Wine.

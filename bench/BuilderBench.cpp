@@ -32,10 +32,18 @@ void BM_BuilderDocument(benchmark::State& state) {
     benchmark::DoNotOptimize(builder.XML().data());
   }
   state.SetItemsProcessed(static_cast<int64_t>(state.iterations()) * state.range(0));
+  state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) *
+                          static_cast<int64_t>(builder.XML().size() * sizeof(char16_t)));
   state.counters["chars"] = static_cast<double>(builder.XML().size());
 }
 
-BENCHMARK(BM_BuilderDocument)->Arg(1000)->Arg(10000)->Arg(100000)->Unit(benchmark::kMicrosecond);
+BENCHMARK(BM_BuilderDocument)
+    ->Arg(1000)
+    ->Arg(10000)
+    ->Arg(100000)
+    ->UseRealTime()
+    ->Repetitions(7)
+    ->Unit(benchmark::kMicrosecond);
 
 }  // namespace
 }  // namespace droqbxml

@@ -36,8 +36,15 @@ void BM_Unescape(benchmark::State& state) {
                           static_cast<int64_t>(escaped.size() * 2));
 }
 
-BENCHMARK(BM_Escape)->Arg(1)->Arg(10)->Arg(100)->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_Unescape)->Arg(1)->Arg(10)->Arg(100)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_Escape)->Arg(1)->Arg(10)->Arg(100)->UseRealTime()->Repetitions(7)->Unit(
+    benchmark::kMillisecond);
+BENCHMARK(BM_Unescape)
+    ->Arg(1)
+    ->Arg(10)
+    ->Arg(100)
+    ->UseRealTime()
+    ->Repetitions(7)
+    ->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace droqbxml

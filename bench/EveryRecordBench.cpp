@@ -64,6 +64,7 @@ void BM_ItemInventoryEveryRecord(benchmark::State& state) {
 }
 
 BENCHMARK(BM_CustomerEveryRecord)
+    ->Arg(5000)
     ->Arg(10000)
     ->Arg(50000)
     ->UseManualTime()

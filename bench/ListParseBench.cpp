@@ -24,7 +24,7 @@ void BM_AccountFirstParse(benchmark::State& state) {
 }
 
 BENCHMARK(BM_ItemInventoryFirstParse)
-    ->Arg(10000)
+    ->Arg(5000)
     ->Arg(50000)
     ->UseManualTime()
     ->Iterations(15)

@@ -1,6 +1,8 @@
 // getElementValue and the empty-element error.
 #include "droqbxml/records/basCommonProcs.hpp"
 
+#include <algorithm>
+
 #include "droqbxml/diagnostics/clsMyErr.hpp"
 #include "droqbxml/records/internal/TextSearch.hpp"
 #include "droqbxml/runtime/ComError.hpp"
@@ -18,19 +20,22 @@ constexpr size_t kSelfClosingWindow = 100;
 }
 
 // The first "<N/>", else the first "<N />", lying wholly inside the window at the cursor:
-// its 0-based position. `open` is "<N". Found from the window's "/>"s, which responses
-// seldom hold.
+// its 0-based position. `open` is "<N". Found from the "/>"s in the window, which
+// responses seldom hold (searched through the read's scope: an absent one is looked for
+// once a read, or in the index).
 size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
-  const TextView window = TextView(value).substr(cursor, kSelfClosingWindow);
+  const size_t windowEnd = std::min(value.size(), cursor + kSelfClosingWindow);
   size_t spaced = Text::npos;
-  for (size_t close = internal::findForward(window, u"/>", 0); close != TextView::npos;
-       close = internal::findForward(window, u"/>", close + 1)) {
-    if (close >= open.size() && window.substr(close - open.size(), open.size()) == open) {
-      return cursor + close - open.size();
+  for (size_t close = internal::SearchScope::find(value, u"/>", cursor);
+       close != TextView::npos && close + 2 <= windowEnd;
+       close = internal::SearchScope::find(value, u"/>", close + 1)) {
+    if (close >= cursor + open.size() &&
+        TextView(value).substr(close - open.size(), open.size()) == open) {
+      return close - open.size();
     }
-    if (spaced == Text::npos && close > open.size() && window[close - 1] == u' ' &&
-        window.substr(close - 1 - open.size(), open.size()) == open) {
-      spaced = cursor + close - 1 - open.size();
+    if (spaced == Text::npos && close >= cursor + open.size() + 1 && value[close - 1] == u' ' &&
+        TextView(value).substr(close - 1 - open.size(), open.size()) == open) {
+      spaced = close - 1 - open.size();
     }
   }
   return spaced;

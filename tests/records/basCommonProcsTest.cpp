@@ -98,7 +98,8 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
     for (const TextView pattern :
          {TextView(u"<A>"), TextView(u"</B>"), TextView(u"<B/>"), TextView(u"<C>"),
           TextView(u"A><"), TextView(u"<"), TextView(u"<AxB>"), TextView(u"<AyB>"),
-          TextView(u"<AzB>"), TextView(u"<A >"), TextView(u"<A b=\"1\">"), TextView(u"<\u00e9>")}) {
+          TextView(u"<AzB>"), TextView(u"<A >"), TextView(u"<A b=\"1\">"), TextView(u"<\u00e9>"),
+          TextView(u"/>")}) {
       const size_t expected = text.find(pattern, from);
       ASSERT_EQ(internal::findForward(text, pattern, from), expected)
           << round << " " << toUtf8(Text(pattern));
@@ -106,6 +107,9 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
       ASSERT_EQ(internal::SearchScope::find(other, pattern, from), other.find(pattern, from));
       if (internal::TagIndex::covers(pattern) && from <= text.size()) {
         ASSERT_EQ(index.find(pattern, from), expected) << toUtf8(Text(pattern));
+      }
+      if (pattern == internal::TagIndex::kSelfClose) {
+        ASSERT_EQ(index.findSelfClose(from), expected);
       }
     }
   }

@@ -135,6 +135,7 @@ TagIndex::TagIndex(TextView text) : text_(text) {
         }
       },
       [&](size_t g) {
+        if (g > 0 && data[g - 1] == u'/') selfCloses_.push_back(static_cast<uint32_t>(g - 1));
         for (const uint32_t p : morePending) close(p, g);
         morePending.clear();
         if (pending != UINT32_MAX) close(pending, g);
@@ -154,6 +155,11 @@ size_t TagIndex::find(TextView pattern, size_t from) const {
   const auto end = at_.begin() + starts_[group + 1];
   const auto found = std::lower_bound(at_.begin() + starts_[group], end, from);
   return found == end ? TextView::npos : *found;
+}
+
+size_t TagIndex::findSelfClose(size_t from) const {
+  const auto found = std::lower_bound(selfCloses_.begin(), selfCloses_.end(), from);
+  return found == selfCloses_.end() ? TextView::npos : *found;
 }
 
 }  // namespace droqbxml::internal

@@ -32,6 +32,10 @@ class TagIndex {
   // For a covered pattern: exactly text.find(pattern, from) of the indexed text.
   size_t find(TextView pattern, size_t from) const;
 
+  // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).
+  static constexpr TextView kSelfClose = u"/>";
+  size_t findSelfClose(size_t from) const;
+
  private:
   struct Slot {
     uint32_t first = UINT32_MAX;  // the name's position in the text of the group's first tag
@@ -51,8 +55,9 @@ class TagIndex {
   // Names whose key's slot belongs to another name.
   std::unordered_map<TextView, uint32_t> others_;
   uint32_t groups_ = 0;
-  std::vector<uint32_t> starts_;  // starts_[g] .. starts_[g + 1]: group g's range of at_
-  std::vector<uint32_t> at_;      // tag positions, grouped, ascending in a group
+  std::vector<uint32_t> starts_;      // starts_[g] .. starts_[g + 1]: group g's range of at_
+  std::vector<uint32_t> at_;          // tag positions, grouped, ascending in a group
+  std::vector<uint32_t> selfCloses_;  // positions of "/>", ascending
 };
 
 }  // namespace droqbxml::internal

@@ -90,9 +90,12 @@ size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
 
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
+  size_t at = TextView::npos;
+  if (pattern == last_ && lastAnswer_.covers(from, at)) return at;
   size_t end = std::min(text.size(), from + kNear);
-  size_t at = findForward(text.substr(0, end), pattern, from);
+  at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
+  if (index_ != nullptr && pattern == TagIndex::kSelfClose) return index_->findSelfClose(from);
   if (TagIndex::covers(pattern)) {
     if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
       // A tag not found nearby: a little further, else (it is far or absent) index the
@@ -111,14 +114,19 @@ size_t SearchScope::search(TextView pattern, size_t from) {
   return at;
 }
 
-bool SearchScope::remembered(TextView pattern, size_t from, size_t& at) const {
-  const auto known = answers_.find(pattern);
-  if (known == answers_.end()) return false;
-  const Answer& answer = known->second;
+bool SearchScope::Answer::covers(size_t start, size_t& found) const {
   // Nothing from `from` on means nothing later either; a match from `from` is the first
   // match from any start up to it.
-  if (from < answer.from || (answer.at != TextView::npos && from > answer.at)) return false;
-  at = answer.at;
+  if (start < from || (at != TextView::npos && start > at)) return false;
+  found = at;
+  return true;
+}
+
+bool SearchScope::remembered(TextView pattern, size_t from, size_t& at) {
+  const auto known = answers_.find(pattern);
+  if (known == answers_.end() || !known->second.covers(from, at)) return false;
+  last_ = pattern;
+  lastAnswer_ = known->second;
   return true;
 }
 
@@ -126,6 +134,8 @@ void SearchScope::remember(TextView pattern, size_t from, size_t at) {
   auto known = answers_.find(pattern);
   if (known == answers_.end()) known = answers_.emplace(Text(pattern), Answer{}).first;
   known->second = Answer{from, at};
+  last_ = pattern;
+  lastAnswer_ = known->second;
 }
 
 }  // namespace droqbxml::internal

@@ -44,12 +44,14 @@ class SearchScope {
 
  private:
   size_t search(TextView pattern, size_t from);
-  bool remembered(TextView pattern, size_t from, size_t& at) const;
+  bool remembered(TextView pattern, size_t from, size_t& at);
   void remember(TextView pattern, size_t from, size_t at);
 
   struct Answer {
-    size_t from;  // the search started here
-    size_t at;    // and found the pattern here (npos: nowhere after from)
+    size_t from = 0;  // the search started here
+    size_t at = 0;    // and found the pattern here (npos: nowhere after from)
+    // Whether this answers a search from `start` too, and with what.
+    bool covers(size_t start, size_t& found) const;
   };
   struct Hash {
     using is_transparent = void;
@@ -59,6 +61,8 @@ class SearchScope {
   const TagIndex* index_ = nullptr;
   std::unique_ptr<TagIndex> ownIndex_;
   std::unordered_map<Text, Answer, Hash, std::equal_to<>> answers_;
+  Text last_;  // the pattern of the answer last remembered or recalled, checked first
+  Answer lastAnswer_{TextView::npos, 0};  // answers nothing
 };
 
 }  // namespace droqbxml::internal
