@@ -2,6 +2,8 @@
 #include "droqbxml/records/basCommonProcs.hpp"
 
 #include <algorithm>
+#include <iterator>
+#include <string>
 
 #include "droqbxml/diagnostics/clsMyErr.hpp"
 #include "droqbxml/records/internal/TextSearch.hpp"
@@ -55,12 +57,26 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
-  // "</N>" built once in a buffer of the thread; "<N>" is the same text without the slash.
-  thread_local Text startTag;
-  thread_local Text endTag;
-  startTag.assign(u"<").append(ElementName).push_back(u'>');
+  // "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names.
+  const size_t n = ElementName.size();
+  char16_t onStack[128];
+  thread_local Text forLongNames;
+  char16_t* tags = onStack;
+  if (2 * n + 5 > std::size(onStack)) {
+    forLongNames.resize(2 * n + 5);
+    tags = forLongNames.data();
+  }
+  tags[0] = u'<';
+  std::char_traits<char16_t>::copy(tags + 1, ElementName.data(), n);
+  tags[n + 1] = u'>';
+  tags[n + 2] = u'<';
+  tags[n + 3] = u'/';
+  std::char_traits<char16_t>::copy(tags + n + 4, ElementName.data(), n);
+  tags[2 * n + 4] = u'>';
+  const TextView startTag(tags, n + 2);
+  const TextView endTag(tags + n + 2, n + 3);
   if (from <= Value.size()) {
-    const size_t at = selfClosingAt(Value, from, TextView(startTag).substr(0, startTag.size() - 1));
+    const size_t at = selfClosingAt(Value, from, startTag.substr(0, n + 1));
     if (at != Text::npos) {
       // Empty by its form: the required test is not made.
       StartPoint = static_cast<int32_t>(at + 1);
@@ -69,7 +85,6 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
     }
   }
   Text result;
-  endTag.assign(u"</").append(ElementName).push_back(u'>');
   const int32_t start = findInResponse(cursor, Value, startTag);
   if (start > 0) {
     StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;

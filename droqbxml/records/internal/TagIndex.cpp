@@ -117,7 +117,7 @@ TagIndex::TagIndex(TextView text) : text_(text) {
     uint32_t group;
   };
   std::vector<Tag> tags;
-  tags.reserve(text.size() / 32);
+  tags.reserve(text.size() / 6);  // more than XML can hold; room never used costs nothing
   uint32_t pending = UINT32_MAX;  // the '<' waiting for its '>'
   std::vector<uint32_t> morePending;
   const char16_t* data = text.data();
