@@ -25,7 +25,7 @@ void DroObjRef::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPo
   thread_local Text tag;  // "<RefName>", made without allocating on most calls
   tag.assign(u"<").append(RefName).push_back(u'>');
   if (basCommonProcs::findInResponse(EndPoint, Value, tag) == 0) return;
-  FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent + tag);
+  FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent, tag);
   reader.read(index<u"ListID">(), Required);
   reader.read(index<u"FullName">(), Required);
 }

@@ -118,7 +118,7 @@ class ListRecordOf : public RecordOf<Derived> {
     if (!own.found) return own.result;
     int32_t start = own.cursor;
     int32_t end = own.cursor;
-    Reader read(static_cast<Derived&>(*this), Value, start, end, Text(returnTag));
+    Reader read(static_cast<Derived&>(*this), Value, start, end, returnTag);
     body(read, start, end);
     return own.result;
   }

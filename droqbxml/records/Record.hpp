@@ -188,13 +188,16 @@ class RecordOf : public Record {
 template <class Derived>
 class FieldReader {
  public:
+  // The parent named by a required element's error is parent + parentTail (views of texts
+  // that outlive the reader), put together only for required elements.
   FieldReader(Derived& record, const Text& value, int32_t& startPoint, int32_t& endPoint,
-              Text parent = {})
+              TextView parent = {}, TextView parentTail = {})
       : record_(record),
         value_(value),
         start_(startPoint),
         end_(endPoint),
-        parent_(std::move(parent)) {}
+        parent_(parent),
+        parentTail_(parentTail) {}
 
   // Each a required element: an empty one raises, naming the parent path.
   template <FieldName... Names>
@@ -213,7 +216,8 @@ class FieldReader {
   const Text& value_;
   int32_t& start_;
   int32_t& end_;
-  Text parent_;
+  TextView parent_;
+  TextView parentTail_;
 };
 
 // Builds a text dump: the heading, then label and TAB-indented value lines and framed
@@ -243,9 +247,15 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  record_.setFieldValue(index, basCommonProcs::getElementValue(
-                                   value_, record_.fieldSpecs()[index].name, start_, end_,
-                                   isRequired, isRequired ? TextView(parent_) : TextView()));
+  const TextView name = record_.fieldSpecs()[index].name;
+  if (!isRequired) {
+    record_.setFieldValue(index,
+                          basCommonProcs::getElementValue(value_, name, start_, end_, false, {}));
+    return;
+  }
+  const Text parent = Text(parent_) + Text(parentTail_);
+  record_.setFieldValue(index,
+                        basCommonProcs::getElementValue(value_, name, start_, end_, true, parent));
 }
 
 }  // namespace droqbxml

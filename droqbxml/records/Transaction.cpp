@@ -74,7 +74,7 @@ const ClassInfo& DroTxnLine<Kind>::typeInfo() {
 
 template <TxnKind Kind>
 void DroTxnLine<Kind>::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
-  FieldReader<DroTxnLine> read(*this, Value, StartPoint, EndPoint, Text(kSpec.lineContext));
+  FieldReader<DroTxnLine> read(*this, Value, StartPoint, EndPoint, kSpec.lineContext);
   read.template required<u"TxnLineID">();
   itemRef_->ParseRs(u"ItemRef", Value, StartPoint, EndPoint);
   read.template optional<u"Desc", u"Quantity", u"Rate", u"RatePercent">();

@@ -328,7 +328,7 @@ int32_t TxnRecordOf<Derived, Kind>::parseTxn(const Text& Value, int32_t StartPoi
     if (!own.found) return position;
     int32_t start = own.cursor;
     int32_t end = own.cursor;
-    Reader read(static_cast<Derived&>(*this), Value, start, end, Text(kSpec.returnTag));
+    Reader read(static_cast<Derived&>(*this), Value, start, end, kSpec.returnTag);
     readHeader(read, start, end);
     lines_->ParseRs(Value, start, end);
     readGroups(*groups_, Value, start, end);
