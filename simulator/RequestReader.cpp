@@ -40,6 +40,19 @@ std::optional<std::string> XmlNode::attribute(std::string_view attributeName) co
   return std::nullopt;
 }
 
+namespace internal {
+
+bool isKnownVersion(std::string_view version) {
+  // The qbXML versions QuickBooks Desktop answers, up to the 13.0 of the stand-in's tables.
+  static constexpr std::string_view kKnownVersions[] = {"1.0",  "1.1",  "2.0",  "2.1", "3.0", "4.0",
+                                                        "4.1",  "5.0",  "6.0",  "7.0", "8.0", "9.0",
+                                                        "10.0", "11.0", "12.0", "13.0"};
+  return std::find(std::begin(kKnownVersions), std::end(kKnownVersions), version) !=
+         std::end(kKnownVersions);
+}
+
+}  // namespace internal
+
 namespace {
 
 using internal::ProblemList;
@@ -112,11 +125,6 @@ bool isVersion(std::string_view version) {
   return point != std::string_view::npos && digits(version.substr(0, point)) &&
          digits(version.substr(point + 1));
 }
-
-// The qbXML versions QuickBooks Desktop answers, up to the 13.0 of the stand-in's tables.
-constexpr std::string_view kKnownVersions[] = {"1.0",  "1.1",  "2.0",  "2.1", "3.0", "4.0",
-                                               "4.1",  "5.0",  "6.0",  "7.0", "8.0", "9.0",
-                                               "10.0", "11.0", "12.0", "13.0"};
 
 // What the hand-read prolog found.
 struct Prolog {
@@ -489,9 +497,7 @@ ReadResult readRequest(std::string_view utf8Document) {
   }
   internal::DeclaredVersion version;
   if (!prolog.version.empty()) {
-    const auto known = std::find(std::begin(kKnownVersions), std::end(kKnownVersions),
-                                 std::string_view(prolog.version));
-    if (known == std::end(kKnownVersions)) {
+    if (!internal::isKnownVersion(prolog.version)) {
       problems.add(lineAt(utf8Document, prolog.versionAt), "",
                    "qbXML version " + internal::quoted(prolog.version) +
                        " is not one QuickBooks Desktop knows (1.0, 1.1, 2.0, 2.1, 3.0, 4.0, 4.1, "
