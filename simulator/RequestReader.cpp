@@ -14,6 +14,7 @@
 #include <utility>
 #include <vector>
 
+#include "droqbxml/runtime/Utf.hpp"
 #include "simulator/RequestDocument.hpp"
 #include "simulator/internal/SchemaCheck.hpp"
 
@@ -57,7 +58,6 @@ namespace {
 
 using internal::ProblemList;
 
-constexpr std::size_t kMaxDocumentBytes = 100 * 1024 * 1024;
 constexpr int kMaxDepth = 200;
 constexpr std::size_t kMaxElements = 1'000'000;
 
@@ -73,40 +73,6 @@ int lineAt(std::string_view text, std::size_t offset) {
     }
   }
   return line;
-}
-
-// The offset of the first byte that does not begin a well-formed UTF-8 character (no
-// overlong forms, surrogates or code points above U+10FFFF), or npos.
-std::size_t firstInvalidUtf8(std::string_view text) {
-  std::size_t i = 0;
-  while (i < text.size()) {
-    const auto lead = static_cast<unsigned char>(text[i]);
-    if (lead < 0x80) {
-      ++i;
-      continue;
-    }
-    std::size_t length = 0;
-    char32_t code = 0;
-    char32_t least = 0;
-    if ((lead & 0xE0) == 0xC0) {
-      length = 2, code = lead & 0x1F, least = 0x80;
-    } else if ((lead & 0xF0) == 0xE0) {
-      length = 3, code = lead & 0x0F, least = 0x800;
-    } else if ((lead & 0xF8) == 0xF0) {
-      length = 4, code = lead & 0x07, least = 0x10000;
-    } else {
-      return i;
-    }
-    if (i + length > text.size()) return i;
-    for (std::size_t k = 1; k < length; ++k) {
-      const auto next = static_cast<unsigned char>(text[i + k]);
-      if ((next & 0xC0) != 0x80) return i;
-      code = (code << 6) | (next & 0x3F);
-    }
-    if (code < least || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF)) return i;
-    i += length;
-  }
-  return std::string_view::npos;
 }
 
 std::string notUtf8(std::string_view text, std::size_t offset) {
@@ -478,10 +444,10 @@ class TreeBuilder {
 ReadResult readRequest(std::string_view utf8Document) {
   ReadResult result;
   ProblemList problems(result.problems);
-  if (utf8Document.size() > kMaxDocumentBytes) {
+  if (utf8Document.size() > kMaxRequestBytes) {
     problems.add(1, "",
                  "the document has " + std::to_string(utf8Document.size()) +
-                     " bytes; a request may have at most " + std::to_string(kMaxDocumentBytes) +
+                     " bytes; a request may have at most " + std::to_string(kMaxRequestBytes) +
                      " (100 MB)");
     return result;
   }
