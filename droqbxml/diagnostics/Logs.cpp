@@ -1,4 +1,5 @@
-// Log file layouts. Each call opens, writes and closes its file.
+// Log file layouts. Each call opens, locks, writes and closes its file, so that entries of
+// threads and processes writing at once stay whole.
 #include "droqbxml/diagnostics/Logs.hpp"
 
 #include <string>
@@ -33,7 +34,7 @@ void appendErrorLog(int32_t number, TextView source, TextView description) {
     createFolderQuietly(u"C:\\Program Files\\Orvanne\\Tessaly");
   }
   createFolderQuietly(path + u"\\Logs");
-  TextFile file(path + u"\\Logs\\ErrorLog.txt", OpenMode::Append);
+  LockedLogFile file(path + u"\\Logs\\ErrorLog.txt");
   Text record = u"Error Date: " + formatLongDateTime(now()) + Text(kCrLf);
   record += u"\terror number: " + asciiText(std::to_string(number)) + Text(kCrLf);
   record += u"\terror source: " + Text(source) + Text(kCrLf);
@@ -41,7 +42,7 @@ void appendErrorLog(int32_t number, TextView source, TextView description) {
   record += u"\t" + Text(description) + Text(kCrLf);
   // A line holding CR LF: every record is followed by two empty lines.
   record += Text(kCrLf) + Text(kCrLf);
-  file.write(record);
+  file.append(record);
 }
 
 void LogFailedExchange(TextView request, TextView response, const LocalTime& sent,
@@ -53,20 +54,19 @@ void LogFailedExchange(TextView request, TextView response, const LocalTime& sen
     createFolderQuietly(path + u"\\Logs");
     createFolderQuietly(path + u"\\Logs\\qbXmlErrors");
     const Text name = path + u"\\Logs\\qbXmlErrors\\qbXML-Error.txt";
-    int64_t length = 0;
-    try {
-      length = fileLength(name);
-    } catch (const ComError&) {
-      length = 0;  // missing: start a new log
-    }
-    const bool restart = length == 0 || length > kFailedExchangeLogLimit;
-    TextFile file(name, restart ? OpenMode::Overwrite : OpenMode::Append);
-    Text entry;
-    if (!restart) entry = u"\r\n\r\n\r\n\r\n\r\n";
-    entry += u"SENDING: " + formatIsoDateTime(sent) + u"\r\n\r\n" + Text(request) + Text(kCrLf);
+    Text entry = u"SENDING: " + formatIsoDateTime(sent) + u"\r\n\r\n" + Text(request) + Text(kCrLf);
     entry += u"\r\n\r\nRECEIVING: " + formatIsoDateTime(received) +
              u"\trequest response status <> success\r\n\r\n\t" + Text(response) + Text(kCrLf);
-    file.write(entry);
+    // Decided and written under the file's lock: a log that starts again loses only what it
+    // held, never an entry another process writes at the same moment.
+    LockedLogFile file(name);
+    const int64_t length = file.length();
+    if (length == 0 || length > kFailedExchangeLogLimit) {
+      file.clear();
+      file.append(entry);
+    } else {
+      file.append(u"\r\n\r\n\r\n\r\n\r\n" + entry);
+    }
   } catch (const ComError&) {
     // The failed-exchange log never gets in the way of the exchange itself.
   }
