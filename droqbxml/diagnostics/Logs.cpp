@@ -14,6 +14,20 @@ namespace {
 constexpr TextView kCrLf = u"\r\n";
 constexpr int64_t kFailedExchangeLogLimit = 512000;
 
+// The most of a request or a response one failed exchange keeps: with both at most three
+// bytes a code unit, an entry stays well under the log's limit.
+constexpr size_t kLoggedLength = 50000;
+
+// `text`, or its first kLoggedLength code units (a surrogate pair kept whole) and a note of
+// how many were left out.
+Text cutToLogged(TextView text) {
+  if (text.size() <= kLoggedLength) return Text(text);
+  size_t kept = kLoggedLength;
+  if (text[kept - 1] >= 0xD800 && text[kept - 1] <= 0xDBFF) --kept;
+  return Text(text.substr(0, kept)) + u"... [" + asciiText(std::to_string(text.size() - kept)) +
+         u" characters left out]";
+}
+
 void createFolderQuietly(TextView path) {
   try {
     createFolder(path);
@@ -54,9 +68,11 @@ void LogFailedExchange(TextView request, TextView response, const LocalTime& sen
     createFolderQuietly(path + u"\\Logs");
     createFolderQuietly(path + u"\\Logs\\qbXmlErrors");
     const Text name = path + u"\\Logs\\qbXmlErrors\\qbXML-Error.txt";
-    Text entry = u"SENDING: " + formatIsoDateTime(sent) + u"\r\n\r\n" + Text(request) + Text(kCrLf);
+    Text entry =
+        u"SENDING: " + formatIsoDateTime(sent) + u"\r\n\r\n" + cutToLogged(request) + Text(kCrLf);
     entry += u"\r\n\r\nRECEIVING: " + formatIsoDateTime(received) +
-             u"\trequest response status <> success\r\n\r\n\t" + Text(response) + Text(kCrLf);
+             u"\trequest response status <> success\r\n\r\n\t" + cutToLogged(response) +
+             Text(kCrLf);
     // Decided and written under the file's lock: a log that starts again loses only what it
     // held, never an entry another process writes at the same moment.
     LockedLogFile file(name);

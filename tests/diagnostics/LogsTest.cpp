@@ -102,6 +102,23 @@ TEST_F(LogsTest, FailedExchangeLogNeedsAFreeFileNumber) {
   EXPECT_FALSE(std::filesystem::exists(drive_.path("T/Logs")));
 }
 
+// One exchange keeps at most 50000 characters of its request and of its response, each cut
+// with a note of what was left out; a surrogate pair at the cut stays whole.
+TEST_F(LogsTest, FailedExchangeKeepsTheStartOfALongRequestAndResponse) {
+  basGlobals::DroPathAccess(Variant(u"C:\\T"));
+  createFolder(u"C:\\T");
+  const Text request = Text(49999, u'q') + u"\U0001F600" + Text(150000, u'q');
+  LogFailedExchange(request, Text(1000000, u'r'), kZeroDate, kZeroDate);
+  LogFailedExchange(Text(50000, u's'), u"", kZeroDate, kZeroDate);
+  const std::string log = readFile(drive_.path("T/Logs/qbXmlErrors/qbXML-Error.txt"));
+  EXPECT_LT(log.size(), 160000u);
+  EXPECT_NE(log.find("\r\n\r\n" + std::string(49999, 'q') + "... [150002 characters left out]\r\n"),
+            std::string::npos);
+  EXPECT_NE(log.find("\t" + std::string(50000, 'r') + "... [950000 characters left out]\r\n"),
+            std::string::npos);
+  EXPECT_NE(log.find("\r\n\r\n" + std::string(50000, 's') + "\r\n"), std::string::npos);
+}
+
 // Entry `seq` of writer `writer`, 10 bytes to 64 KB over `parts` texts: it names both and is
 // one letter after that, so that a torn or mixed entry cannot pass for a whole one.
 std::string entryText(int writer, int seq, size_t parts) {
