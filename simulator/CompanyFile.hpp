@@ -47,9 +47,11 @@ class CompanyFileError : public std::runtime_error {
 class CompanyFile {
  public:
   // Creates a new company file with what a new QuickBooks company holds, all in one
-  // transaction. Refuses a path that exists (AlreadyExists), a missing folder (Missing) and a
-  // folder that cannot be written (ReadOnly); after any later failure the half-made file is
-  // removed and the failure rethrown.
+  // transaction, built under another name in the same folder and given its name when whole:
+  // the file exists whole or not at all, also when the process is killed on the way. Refuses
+  // a path that exists (AlreadyExists), a missing folder (Missing) and a folder that cannot
+  // be written (ReadOnly); after any later failure the half-made file is removed and the
+  // failure rethrown.
   static void create(const std::filesystem::path& path, const CompanySettings& settings);
 
   // Opens an existing company file. Throws CompanyFileError: Missing, Unreadable,

@@ -69,12 +69,37 @@ TEST(CompanyFileTest, CreateKeepsTheSettingsAndRefusesAnExistingPath) {
   EXPECT_EQ(failure([&] { CompanyFile::create(folder / "no-such-folder" / "a.qbw", {}); }),
             Kind::Missing);
 
-  // A half-made file is removed: here a folder where SQLite's journal must go makes the
-  // creating transaction fail.
-  std::filesystem::create_directory(folder / "half.qbw-journal");
+  // A half-made file is removed: here a folder where SQLite's journal of the file being built
+  // must go makes the creating transaction fail.
+  const auto building = folder / (".half.qbw." + std::to_string(::getpid()) + "-0.building");
+  std::filesystem::create_directory(building.string() + "-journal");
   EXPECT_THROW(CompanyFile::create(folder / "half.qbw", {}), std::runtime_error);
   EXPECT_FALSE(std::filesystem::exists(folder / "half.qbw"));
-  EXPECT_TRUE(std::filesystem::is_directory(folder / "half.qbw-journal"));
+  EXPECT_FALSE(std::filesystem::exists(building));
+  EXPECT_TRUE(std::filesystem::is_directory(building.string() + "-journal"));
+}
+
+// A process killed while it creates a company file leaves the whole file or none of that
+// name, which can then be created afresh.
+TEST(CompanyFileTest, ACreationKilledHalfwayLeavesTheWholeFileOrNone) {
+  test::TemporaryFolder folder;
+  for (int round = 0; round < 5; ++round) {
+    const auto path = folder / ("killed" + std::to_string(round) + ".qbw");
+    const pid_t child = test::startChild([&] {
+      CompanyFile::create(path, {});
+      return 0;
+    });
+    std::error_code ignored;
+    while (!std::filesystem::exists(path, ignored) && ::kill(child, 0) == 0) {
+    }
+    ::kill(child, SIGKILL);
+    test::finishChild(child);
+    if (std::filesystem::exists(path)) {
+      EXPECT_FALSE(openFailure(path)) << path;
+    } else {
+      EXPECT_NO_THROW(CompanyFile::create(path, {})) << path;
+    }
+  }
 }
 
 TEST(CompanyFileTest, OpenTellsMissingForeignAndDamagedFilesApart) {
