@@ -1,7 +1,8 @@
 // The company file on SQLite: the stand-in's own tables (settings, counters, integrated
 // applications) beside the lists and transactions the request handlers keep. Opening checks,
 // in this order, that the file exists and can be read, is SQLite, carries the company-file
-// marker, passes SQLite's integrity check, and can be written.
+// marker, passes SQLite's integrity check, and, unless it is opened for reading alone, can be
+// written.
 #include "simulator/CompanyFile.hpp"
 
 #include <fcntl.h>
@@ -258,7 +259,7 @@ void CompanyFile::create(const std::filesystem::path& path, const CompanySetting
   removeCompanyFile(building);
 }
 
-CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
+CompanyFile::CompanyFile(const std::filesystem::path& path, Mode mode) : path_(path) {
   std::error_code error;
   const auto status = std::filesystem::status(path, error);
   if (status.type() == std::filesystem::file_type::not_found) {
@@ -268,7 +269,9 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
   if (!std::filesystem::is_regular_file(status)) fail(Kind::Unreadable, path, "not a file");
 
   sqlite3* raw = nullptr;
-  const int opened = sqlite3_open_v2(path.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
+  const int opened = sqlite3_open_v2(
+      path.c_str(), &raw, mode == Mode::ReadOnly ? SQLITE_OPEN_READONLY : SQLITE_OPEN_READWRITE,
+      nullptr);
   Database db(raw);
   if (opened != SQLITE_OK) {
     if ((opened & 0xff) == SQLITE_CANTOPEN) fail(Kind::Unreadable, path, sqlite3_errmsg(raw));
@@ -303,10 +306,12 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
     }
     if (!findings.empty()) fail(Kind::Damaged, path, findings);
   }
-  if (sqlite3_db_readonly(db.get(), "main") != 0) {
-    fail(Kind::ReadOnly, path, "the file cannot be written");
+  if (mode == Mode::ReadWrite) {
+    if (sqlite3_db_readonly(db.get(), "main") != 0) {
+      fail(Kind::ReadOnly, path, "the file cannot be written");
+    }
+    if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
   }
-  if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
 
   configure(db.get());
   db_ = db.release();

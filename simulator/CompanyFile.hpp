@@ -54,11 +54,16 @@ class CompanyFile {
   // failure rethrown.
   static void create(const std::filesystem::path& path, const CompanySettings& settings);
 
+  // What an open is for: changes (sessions, company allow and deny), or reading alone
+  // (company show).
+  enum class Mode { ReadWrite, ReadOnly };
+
   // Opens an existing company file. Throws CompanyFileError: Missing, Unreadable,
   // NotACompanyFile (not SQLite, or SQLite without the company-file marker), Damaged (SQLite's
   // integrity check fails), ReadOnly (the file or its folder cannot be written: the stand-in
-  // must refuse at session begin what it could not change later), Busy.
-  explicit CompanyFile(const std::filesystem::path& path);
+  // must refuse at session begin what it could not change later; never for Mode::ReadOnly,
+  // which opens a file that cannot be written and refuses every change), Busy.
+  explicit CompanyFile(const std::filesystem::path& path, Mode mode = Mode::ReadWrite);
   ~CompanyFile();
   CompanyFile(const CompanyFile&) = delete;
   CompanyFile& operator=(const CompanyFile&) = delete;

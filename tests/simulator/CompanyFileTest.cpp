@@ -11,6 +11,7 @@
 
 #include "simulator/CompanyFile.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/cli/CliRunner.hpp"
 #include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml::simulator {
@@ -133,7 +134,9 @@ TEST(CompanyFileTest, OpenTellsMissingForeignAndDamagedFilesApart) {
   for (const auto& [path, kind] : cases) EXPECT_EQ(openFailure(path), kind) << path;
 }
 
-TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
+// A file this user may not change is refused when opened for changes and read when opened
+// for reading alone, as company show does.
+TEST(CompanyFileTest, OpenForChangesRefusesAFileThatCannotBeWritten) {
   test::TemporaryFolder folder;
   const auto path = folder / "locked.qbw";
   CompanyFile::create(path, {});
@@ -142,25 +145,34 @@ TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
   constexpr perms kListable =
       kReadable | perms::owner_exec | perms::group_exec | perms::others_exec;
   constexpr int kOpens = 100;
+  constexpr int kReadOnly = static_cast<int>(Kind::ReadOnly);
+  constexpr int kUnreadable = static_cast<int>(Kind::Unreadable);
   const struct {
     perms folder;
     perms file;
-    int expected;
+    int forChanges;
+    int forReading;
   } cases[] = {
-      {perms::all, perms::all, kOpens},
-      {perms::all, kReadable, static_cast<int>(Kind::ReadOnly)},
-      {kListable, perms::all, static_cast<int>(Kind::ReadOnly)},
-      {perms::all, perms::none, static_cast<int>(Kind::Unreadable)},
+      {perms::all, perms::all, kOpens, kOpens},
+      {perms::all, kReadable, kReadOnly, kOpens},
+      {kListable, perms::all, kReadOnly, kOpens},
+      {perms::all, perms::none, kUnreadable, kUnreadable},
   };
   for (const auto& c : cases) {
     std::filesystem::permissions(folder.root(), c.folder);
     std::filesystem::permissions(path, c.file);
-    const int result = test::runUnprivileged([&] {
-      const auto failed = openFailure(path);
-      return failed ? static_cast<int>(*failed) : kOpens;
+    for (const auto mode : {CompanyFile::Mode::ReadWrite, CompanyFile::Mode::ReadOnly}) {
+      const int result = test::runUnprivileged([&] {
+        const auto failed = failure([&] { CompanyFile company(path, mode); });
+        return failed ? static_cast<int>(*failed) : kOpens;
+      });
+      if (result == test::kCannotDropRights) GTEST_SKIP() << "cannot run as an ordinary user";
+      EXPECT_EQ(result, mode == CompanyFile::Mode::ReadWrite ? c.forChanges : c.forReading);
+    }
+    const int shown = test::runUnprivileged([&] {
+      return test::runCli({"company", "show", path.string()}).code;
     });
-    if (result == test::kCannotDropRights) GTEST_SKIP() << "cannot run as an ordinary user";
-    EXPECT_EQ(result, c.expected);
+    EXPECT_EQ(shown, c.forReading == kOpens ? cli::kExitSuccess : cli::kExitConnection);
   }
 }
 
