@@ -147,8 +147,9 @@ TEST_F(LogsTest, EntriesOfProcessesWritingAtOnceStayWhole) {
       if (::fork() != 0) continue;
       ::close(start[1]);
       if (char none = 0; ::read(start[0], &none, 1) != 0) ::_exit(1);
-      for (int seq = burst * rounds; seq < (burst + 1) * rounds; ++seq)
+      for (int seq = burst * rounds; seq < (burst + 1) * rounds; ++seq) {
         write(entryText(writer, seq));
+      }
       ::_exit(0);
     }
     ::close(start[1]);
