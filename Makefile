@@ -1,6 +1,6 @@
 # The two commands a new machine needs: `make test` and `make demo`. Both install any
 # missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
-.PHONY: all setup test bench demo com com-test fault-check format clean
+.PHONY: all setup test bench demo com com-test fault-check clang-check log-stress format clean
 
 all: test
 
@@ -51,6 +51,21 @@ demo: setup
 # Deliberate faults, one per area, each of which the tests must catch (some minutes).
 fault-check: setup
 	python3 scripts/fault-check.py
+
+# The library, the stand-in and the command built with clang++ instead of g++ (warnings as
+# errors), to keep the sources free of what only one compiler accepts.
+clang-check:
+	CXX=clang++ cmake -S . -B build/clang -G Ninja -DCMAKE_BUILD_TYPE=Debug \
+	  -DDROQBXML_BUILD_TESTS=OFF -DDROQBXML_WARNINGS_AS_ERRORS=ON -DDROQBXML_INSTALL=OFF
+	cmake --build build/clang
+
+# Eight processes writing both logs at once, a hundred entries of up to 64 KB each per burst
+# (the suite runs four; some minutes).
+log-stress:
+	cmake --preset test
+	cmake --build --preset test
+	DROQBXML_LOG_ROUNDS=100 ./build/test/tests/droqbxml_tests \
+	  --gtest_filter=LogsTest.EntriesOfProcessesWritingAtOnceStayWhole
 
 format:
 	clang-format -i $$(git ls-files '*.cpp' '*.hpp')

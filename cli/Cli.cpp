@@ -6,6 +6,7 @@
 #include <array>
 #include <chrono>
 #include <cstdio>
+#include <exception>
 #include <string>
 #include <utility>
 #include <vector>
@@ -143,11 +144,16 @@ constexpr const char* kExitCodes =
     "Exit codes (every command):\n"
     "  0  done; every response QuickBooks sent has statusSeverity Info\n"
     "  1  a response is a warning or an error; lint found problems\n"
-    "  2  usage: bad arguments, an unreadable or empty request document, an existing file\n"
+    "  2  usage: bad arguments, an existing file, a request document that is unreadable,\n"
+    "     empty, not a regular file, over 100 MB or not UTF-8\n"
     "  3  no request processor, no connection or session, a company file that cannot be\n"
-    "     opened, a request QuickBooks could not parse or a response that is not qbXML\n";
+    "     opened, a request QuickBooks could not parse, a response that is not qbXML, or\n"
+    "     a failure nothing foresaw\n";
 
-int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, std::ostream& err) {
+namespace {
+
+int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream& out,
+               std::ostream& err) {
   CLI::App app{"Exchanges qbXML with a QuickBooks company file through DroQbXml.", "droqbxml"};
   app.require_subcommand(1);
   // Global options may come before or after the command.
@@ -300,6 +306,21 @@ int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, 
     return escape->parsed() || unescape->parsed() ? kExitUsage : kExitConnection;
   }
   return kExitUsage;
+}
+
+}  // namespace
+
+int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, std::ostream& err) {
+  // The last resort: whatever a command did not expect ends it with one line and a code a
+  // script knows, never with the runtime's abort.
+  try {
+    return runCommand(argc, argv, in, out, err);
+  } catch (const std::exception& error) {
+    err << "droqbxml: unexpected failure: " << error.what() << '\n';
+  } catch (...) {
+    err << "droqbxml: unexpected failure\n";
+  }
+  return kExitConnection;
 }
 
 }  // namespace droqbxml::cli

@@ -13,6 +13,8 @@ inline constexpr int kExitNotSuccess = 1;  // QuickBooks answered with another s
 inline constexpr int kExitUsage = 2;
 inline constexpr int kExitConnection = 3;  // no processor, connection or session failure
 
+// Runs one command line; returns one of the exit codes above, whatever happens (a failure
+// nothing expected is reported in one line and ends with kExitConnection).
 int run(int argc, const char* const* argv, std::istream& in, std::ostream& out, std::ostream& err);
 
 }  // namespace droqbxml::cli

@@ -21,9 +21,9 @@ using simulator::CompanyFileError;
 std::filesystem::path fileOf(const std::string& path) { return mapPath(fromUtf8(path)); }
 
 template <class F>
-int withCompanyFile(Io io, const std::string& path, F work) {
+int withCompanyFile(Io io, const std::string& path, CompanyFile::Mode mode, F work) {
   try {
-    CompanyFile company(fileOf(path));
+    CompanyFile company(fileOf(path), mode);
     return work(company);
   } catch (const CompanyFileError& error) {
     io.err << "droqbxml: " << error.what() << '\n';
@@ -48,14 +48,15 @@ int companyCreateCommand(Io io, const CompanyOptions& options) {
 }
 
 int companyShowCommand(Io io, const CompanyOptions& options) {
-  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+  // Reading alone: a file this user may not change can still be shown.
+  return withCompanyFile(io, options.path, CompanyFile::Mode::ReadOnly, [&](CompanyFile& company) {
     io.out << company.summary();
     return kExitSuccess;
   });
 }
 
 int companyAllowCommand(Io io, const CompanyOptions& options) {
-  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+  return withCompanyFile(io, options.path, CompanyFile::Mode::ReadWrite, [&](CompanyFile& company) {
     company.setApplication(options.appName, {true, options.autoLogin});
     io.out << "\"" << options.appName << "\" may use " << options.path
            << (options.autoLogin ? " and log in automatically" : " when a user is logged in")
@@ -65,7 +66,7 @@ int companyAllowCommand(Io io, const CompanyOptions& options) {
 }
 
 int companyDenyCommand(Io io, const CompanyOptions& options) {
-  return withCompanyFile(io, options.path, [&](CompanyFile& company) {
+  return withCompanyFile(io, options.path, CompanyFile::Mode::ReadWrite, [&](CompanyFile& company) {
     company.setApplication(options.appName, {false, false});
     io.out << "\"" << options.appName << "\" may not use " << options.path << '\n';
     return kExitSuccess;

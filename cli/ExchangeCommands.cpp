@@ -1,10 +1,10 @@
 // send, query, build query, escape and unescape: the commands that talk qbXML through the
 // facade, the builder and the wrapper as a host does.
+#include <algorithm>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
-#include <iterator>
 #include <type_traits>
 
 #include "cli/Cli.hpp"
@@ -182,6 +182,37 @@ int exchangeOne(Io io, const Text& request, const ConnectionOptions& connection,
   return reportResponse(io, session, format);
 }
 
+// At most `limit` bytes of a stream, so that an endless one (a device, a pipe that never
+// closes) is not read to the end.
+std::string readAtMost(std::istream& in, std::size_t limit) {
+  std::string bytes;
+  constexpr std::size_t kChunk = 1 << 16;
+  while (bytes.size() < limit && in) {
+    const std::size_t had = bytes.size();
+    bytes.resize(had + std::min(kChunk, limit - had));
+    in.read(bytes.data() + had, static_cast<std::streamsize>(bytes.size() - had));
+    bytes.resize(had + static_cast<std::size_t>(in.gcount()));
+  }
+  return bytes;
+}
+
+// What a path that is not a regular file is, in words.
+std::string kindOf(const std::filesystem::file_status& status) {
+  switch (status.type()) {
+    case std::filesystem::file_type::directory:
+      return "a folder";
+    case std::filesystem::file_type::character:
+    case std::filesystem::file_type::block:
+      return "a device";
+    case std::filesystem::file_type::fifo:
+      return "a pipe";
+    case std::filesystem::file_type::socket:
+      return "a socket";
+    default:
+      return "a special file";
+  }
+}
+
 void createFolders(const Text& path) {
   std::error_code ignored;
   std::filesystem::create_directories(mapPath(path), ignored);
@@ -351,16 +382,35 @@ Text buildQuery(const QueryOptions& query) {
 }
 
 std::optional<std::string> readDocument(Io io, const std::string& file) {
+  const std::string name = file == "-" ? "on standard input" : "\"" + file + "\"";
+  const auto refuse = [&](const std::string& why) -> std::optional<std::string> {
+    io.err << "droqbxml: the request document " << name << ' ' << why << '\n';
+    return std::nullopt;
+  };
   std::string bytes;
   if (file == "-") {
-    bytes.assign(std::istreambuf_iterator<char>(io.in), std::istreambuf_iterator<char>());
+    bytes = readAtMost(io.in, simulator::kMaxRequestBytes + 1);
   } else {
+    std::error_code error;
+    const auto status = std::filesystem::status(file, error);
+    if (std::filesystem::exists(status) && !std::filesystem::is_regular_file(status)) {
+      return refuse("is " + kindOf(status) + ", not a regular file (- reads standard input)");
+    }
     std::ifstream stream(file, std::ios::binary);
-    if (!stream) {
+    if (stream) bytes = readAtMost(stream, simulator::kMaxRequestBytes + 1);
+    if (!stream.is_open() || stream.bad()) {
       io.err << "droqbxml: cannot read the request document \"" << file << "\"\n";
       return std::nullopt;
     }
-    bytes.assign(std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>());
+  }
+  if (bytes.size() > simulator::kMaxRequestBytes) {
+    return refuse("has more than " + std::to_string(simulator::kMaxRequestBytes) +
+                  " bytes, the most a request may have (100 MB)");
+  }
+  if (const std::size_t bad = firstInvalidUtf8(bytes); bad != std::string::npos) {
+    char byte[8];
+    std::snprintf(byte, sizeof byte, "0x%02X", static_cast<unsigned char>(bytes[bad]));
+    return refuse("is not UTF-8: byte " + std::string(byte) + " at offset " + std::to_string(bad));
   }
   if (bytes.rfind("\xEF\xBB\xBF", 0) == 0) bytes.erase(0, 3);
   return bytes;

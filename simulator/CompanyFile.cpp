@@ -1,7 +1,8 @@
 // The company file on SQLite: the stand-in's own tables (settings, counters, integrated
 // applications) beside the lists and transactions the request handlers keep. Opening checks,
 // in this order, that the file exists and can be read, is SQLite, carries the company-file
-// marker, passes SQLite's integrity check, and can be written.
+// marker, passes SQLite's integrity check, and, unless it is opened for reading alone, can be
+// written.
 #include "simulator/CompanyFile.hpp"
 
 #include <fcntl.h>
@@ -173,6 +174,27 @@ void removeCompanyFile(const std::filesystem::path& path) noexcept {
   }
 }
 
+// Creates an empty file beside `path`, under a name no other process uses
+// (".NAME.PID-N.building"), for the company file to be built in; failures name `path`.
+std::filesystem::path claimBuildingName(const std::filesystem::path& path) {
+  for (int attempt = 0;; ++attempt) {
+    const std::filesystem::path building =
+        path.parent_path() / ("." + path.filename().string() + "." + std::to_string(::getpid()) +
+                              "-" + std::to_string(attempt) + ".building");
+    const int descriptor = ::open(building.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+    if (descriptor >= 0) {
+      ::close(descriptor);
+      return building;
+    }
+    const int error = errno;
+    if (error == EEXIST && attempt < 100) continue;  // left by a process killed while building
+    const std::string reason = std::generic_category().message(error);
+    if (error == ENOENT || error == ENOTDIR) fail(Kind::Missing, path, reason);
+    if (error == EACCES || error == EPERM || error == EROFS) fail(Kind::ReadOnly, path, reason);
+    fail(Kind::Unreadable, path, reason);
+  }
+}
+
 // Whether this process may create files in the folder holding `path` (SQLite's journal).
 bool folderWritable(const std::filesystem::path& path) {
   std::filesystem::path folder = path.parent_path();
@@ -204,37 +226,40 @@ bool hasTable(sqlite3* db, std::string_view table) {
 }  // namespace
 
 void CompanyFile::create(const std::filesystem::path& path, const CompanySettings& settings) {
-  // Claiming the name with O_EXCL refuses an existing file even when another process
-  // creates the same one at the same moment.
-  const int descriptor = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
-  if (descriptor < 0) {
-    const int error = errno;
-    const std::string reason = std::generic_category().message(error);
-    if (error == EEXIST) fail(Kind::AlreadyExists, path, "the file exists already");
-    if (error == ENOENT || error == ENOTDIR) fail(Kind::Missing, path, reason);
-    if (error == EACCES || error == EPERM || error == EROFS) fail(Kind::ReadOnly, path, reason);
-    fail(Kind::Unreadable, path, reason);
+  // The file is built under a name of its own in the same folder and given its name only
+  // when whole, by a link that refuses an existing file, even one another process creates at
+  // the same moment: a process killed on the way leaves no file of that name.
+  std::error_code ignored;
+  if (std::filesystem::exists(std::filesystem::symlink_status(path, ignored))) {
+    fail(Kind::AlreadyExists, path, "the file exists already");
   }
-  ::close(descriptor);
-
+  const std::filesystem::path building = claimBuildingName(path);
   try {
-    sqlite3* raw = nullptr;
-    const int opened = sqlite3_open_v2(path.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
-    const Database db(raw);
-    if (opened != SQLITE_OK) failSqlite(db.get(), opened, "open");
-    configure(db.get());
-    execute(db.get(), "PRAGMA journal_mode = DELETE");
-    execute(db.get(), "BEGIN IMMEDIATE");
-    writeOwnTables(db.get(), settings);
-    initializeCompanyData(db.get(), settings);
-    execute(db.get(), "COMMIT");
+    {
+      sqlite3* raw = nullptr;
+      const int opened = sqlite3_open_v2(building.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
+      const Database db(raw);
+      if (opened != SQLITE_OK) failSqlite(db.get(), opened, "open");
+      configure(db.get());
+      execute(db.get(), "PRAGMA journal_mode = DELETE");
+      execute(db.get(), "BEGIN IMMEDIATE");
+      writeOwnTables(db.get(), settings);
+      initializeCompanyData(db.get(), settings);
+      execute(db.get(), "COMMIT");
+    }
+    if (::link(building.c_str(), path.c_str()) != 0) {
+      const int error = errno;
+      if (error == EEXIST) fail(Kind::AlreadyExists, path, "the file exists already");
+      fail(Kind::Unreadable, path, std::generic_category().message(error));
+    }
   } catch (...) {
-    removeCompanyFile(path);
+    removeCompanyFile(building);
     throw;
   }
+  removeCompanyFile(building);
 }
 
-CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
+CompanyFile::CompanyFile(const std::filesystem::path& path, Mode mode) : path_(path) {
   std::error_code error;
   const auto status = std::filesystem::status(path, error);
   if (status.type() == std::filesystem::file_type::not_found) {
@@ -244,7 +269,9 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
   if (!std::filesystem::is_regular_file(status)) fail(Kind::Unreadable, path, "not a file");
 
   sqlite3* raw = nullptr;
-  const int opened = sqlite3_open_v2(path.c_str(), &raw, SQLITE_OPEN_READWRITE, nullptr);
+  const int opened = sqlite3_open_v2(
+      path.c_str(), &raw, mode == Mode::ReadOnly ? SQLITE_OPEN_READONLY : SQLITE_OPEN_READWRITE,
+      nullptr);
   Database db(raw);
   if (opened != SQLITE_OK) {
     if ((opened & 0xff) == SQLITE_CANTOPEN) fail(Kind::Unreadable, path, sqlite3_errmsg(raw));
@@ -279,10 +306,12 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
     }
     if (!findings.empty()) fail(Kind::Damaged, path, findings);
   }
-  if (sqlite3_db_readonly(db.get(), "main") != 0) {
-    fail(Kind::ReadOnly, path, "the file cannot be written");
+  if (mode == Mode::ReadWrite) {
+    if (sqlite3_db_readonly(db.get(), "main") != 0) {
+      fail(Kind::ReadOnly, path, "the file cannot be written");
+    }
+    if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
   }
-  if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
 
   configure(db.get());
   db_ = db.release();

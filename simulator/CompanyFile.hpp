@@ -47,16 +47,23 @@ class CompanyFileError : public std::runtime_error {
 class CompanyFile {
  public:
   // Creates a new company file with what a new QuickBooks company holds, all in one
-  // transaction. Refuses a path that exists (AlreadyExists), a missing folder (Missing) and a
-  // folder that cannot be written (ReadOnly); after any later failure the half-made file is
-  // removed and the failure rethrown.
+  // transaction, built under another name in the same folder and given its name when whole:
+  // the file exists whole or not at all, also when the process is killed on the way. Refuses
+  // a path that exists (AlreadyExists), a missing folder (Missing) and a folder that cannot
+  // be written (ReadOnly); after any later failure the half-made file is removed and the
+  // failure rethrown.
   static void create(const std::filesystem::path& path, const CompanySettings& settings);
+
+  // What an open is for: changes (sessions, company allow and deny), or reading alone
+  // (company show).
+  enum class Mode { ReadWrite, ReadOnly };
 
   // Opens an existing company file. Throws CompanyFileError: Missing, Unreadable,
   // NotACompanyFile (not SQLite, or SQLite without the company-file marker), Damaged (SQLite's
   // integrity check fails), ReadOnly (the file or its folder cannot be written: the stand-in
-  // must refuse at session begin what it could not change later), Busy.
-  explicit CompanyFile(const std::filesystem::path& path);
+  // must refuse at session begin what it could not change later; never for Mode::ReadOnly,
+  // which opens a file that cannot be written and refuses every change), Busy.
+  explicit CompanyFile(const std::filesystem::path& path, Mode mode = Mode::ReadWrite);
   ~CompanyFile();
   CompanyFile(const CompanyFile&) = delete;
   CompanyFile& operator=(const CompanyFile&) = delete;

@@ -65,6 +65,9 @@ struct ReadResult {
   std::vector<Problem> problems;
 };
 
+// The largest request document QuickBooks is given to read: 100 MB.
+inline constexpr std::size_t kMaxRequestBytes = 100 * 1024 * 1024;
+
 // Reads and checks a whole request document. Never throws for any input: malformed XML,
 // unknown requests, entity tricks (no DTD is ever expanded), deep nesting and oversized
 // documents all come back as problems.

@@ -1,8 +1,8 @@
 // The stand-in's request processing: a new company's lists, and a document's requests routed
 // to their handlers one by one, each in its own transaction, following the document's
 // onError: stopOnError ends at the first request refused with an error, continueOnError goes
-// on, rollbackOnError QuickBooks refuses as a parse error. A request type the stand-in does
-// not model is answered as QuickBooks answers one it does not support.
+// on, rollbackOnError and an unknown qbXML version QuickBooks refuses as a parse error. A request
+// type the stand-in does not model is answered as QuickBooks answers one it does not support.
 #include "simulator/RequestHandlers.hpp"
 
 #include <array>
@@ -17,6 +17,7 @@
 #include "simulator/handlers/Handlers.hpp"
 #include "simulator/handlers/Status.hpp"
 #include "simulator/handlers/Store.hpp"
+#include "simulator/internal/SchemaCheck.hpp"
 
 namespace droqbxml::simulator {
 namespace {
@@ -100,6 +101,9 @@ std::string answerRequests(CompanyFile& company, const RequestDocument& document
   if (messages == nullptr) refuseDocument();
   const std::string onError = messages->attribute("onError").value_or("stopOnError");
   if (onError == "rollbackOnError") refuseDocument();
+  // The reader refuses a version QuickBooks does not know; so does a document that got here
+  // without it.
+  if (!internal::isKnownVersion(document.qbxmlVersion)) refuseDocument();
 
   handlers::Store store(company.db());
   handlers::Context context(company, store, handlers::QbxmlVersion::parse(document.qbxmlVersion));

@@ -20,8 +20,9 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings);
 
 // Answers every request of a document that readRequest accepted, each request in its own
 // transaction, following the document's onError; returns the response document (UTF-8,
-// LF line ends, as QuickBooks writes it). A document with onError="rollbackOnError" is
-// refused as QuickBooks refuses it: a ComError 0x80040400, nothing answered.
+// LF line ends, as QuickBooks writes it). A document with onError="rollbackOnError" or a
+// qbXML version QuickBooks does not know is refused as QuickBooks refuses it: a ComError
+// 0x80040400, nothing answered.
 // Times written (TimeCreated, TimeModified, EditSequence, the ListID and TxnID suffixes,
 // default dates) come from the present moment in local time, or, when the environment
 // variable DROQBXML_SIMULATOR_NOW holds a date and time such as "2009-03-02T10:40:23-05:00",

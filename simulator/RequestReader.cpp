@@ -14,6 +14,7 @@
 #include <utility>
 #include <vector>
 
+#include "droqbxml/runtime/Utf.hpp"
 #include "simulator/RequestDocument.hpp"
 #include "simulator/internal/SchemaCheck.hpp"
 
@@ -40,11 +41,23 @@ std::optional<std::string> XmlNode::attribute(std::string_view attributeName) co
   return std::nullopt;
 }
 
+namespace internal {
+
+bool isKnownVersion(std::string_view version) {
+  // The qbXML versions QuickBooks Desktop answers, up to the 13.0 of the stand-in's tables.
+  static constexpr std::string_view kKnownVersions[] = {"1.0",  "1.1",  "2.0",  "2.1", "3.0", "4.0",
+                                                        "4.1",  "5.0",  "6.0",  "7.0", "8.0", "9.0",
+                                                        "10.0", "11.0", "12.0", "13.0"};
+  return std::find(std::begin(kKnownVersions), std::end(kKnownVersions), version) !=
+         std::end(kKnownVersions);
+}
+
+}  // namespace internal
+
 namespace {
 
 using internal::ProblemList;
 
-constexpr std::size_t kMaxDocumentBytes = 100 * 1024 * 1024;
 constexpr int kMaxDepth = 200;
 constexpr std::size_t kMaxElements = 1'000'000;
 
@@ -60,40 +73,6 @@ int lineAt(std::string_view text, std::size_t offset) {
     }
   }
   return line;
-}
-
-// The offset of the first byte that does not begin a well-formed UTF-8 character (no
-// overlong forms, surrogates or code points above U+10FFFF), or npos.
-std::size_t firstInvalidUtf8(std::string_view text) {
-  std::size_t i = 0;
-  while (i < text.size()) {
-    const auto lead = static_cast<unsigned char>(text[i]);
-    if (lead < 0x80) {
-      ++i;
-      continue;
-    }
-    std::size_t length = 0;
-    char32_t code = 0;
-    char32_t least = 0;
-    if ((lead & 0xE0) == 0xC0) {
-      length = 2, code = lead & 0x1F, least = 0x80;
-    } else if ((lead & 0xF0) == 0xE0) {
-      length = 3, code = lead & 0x0F, least = 0x800;
-    } else if ((lead & 0xF8) == 0xF0) {
-      length = 4, code = lead & 0x07, least = 0x10000;
-    } else {
-      return i;
-    }
-    if (i + length > text.size()) return i;
-    for (std::size_t k = 1; k < length; ++k) {
-      const auto next = static_cast<unsigned char>(text[i + k]);
-      if ((next & 0xC0) != 0x80) return i;
-      code = (code << 6) | (next & 0x3F);
-    }
-    if (code < least || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF)) return i;
-    i += length;
-  }
-  return std::string_view::npos;
 }
 
 std::string notUtf8(std::string_view text, std::size_t offset) {
@@ -112,11 +91,6 @@ bool isVersion(std::string_view version) {
   return point != std::string_view::npos && digits(version.substr(0, point)) &&
          digits(version.substr(point + 1));
 }
-
-// The qbXML versions QuickBooks Desktop answers, up to the 13.0 of the stand-in's tables.
-constexpr std::string_view kKnownVersions[] = {"1.0",  "1.1",  "2.0",  "2.1", "3.0", "4.0",
-                                               "4.1",  "5.0",  "6.0",  "7.0", "8.0", "9.0",
-                                               "10.0", "11.0", "12.0", "13.0"};
 
 // What the hand-read prolog found.
 struct Prolog {
@@ -470,10 +444,10 @@ class TreeBuilder {
 ReadResult readRequest(std::string_view utf8Document) {
   ReadResult result;
   ProblemList problems(result.problems);
-  if (utf8Document.size() > kMaxDocumentBytes) {
+  if (utf8Document.size() > kMaxRequestBytes) {
     problems.add(1, "",
                  "the document has " + std::to_string(utf8Document.size()) +
-                     " bytes; a request may have at most " + std::to_string(kMaxDocumentBytes) +
+                     " bytes; a request may have at most " + std::to_string(kMaxRequestBytes) +
                      " (100 MB)");
     return result;
   }
@@ -489,9 +463,7 @@ ReadResult readRequest(std::string_view utf8Document) {
   }
   internal::DeclaredVersion version;
   if (!prolog.version.empty()) {
-    const auto known = std::find(std::begin(kKnownVersions), std::end(kKnownVersions),
-                                 std::string_view(prolog.version));
-    if (known == std::end(kKnownVersions)) {
+    if (!internal::isKnownVersion(prolog.version)) {
       problems.add(lineAt(utf8Document, prolog.versionAt), "",
                    "qbXML version " + internal::quoted(prolog.version) +
                        " is not one QuickBooks Desktop knows (1.0, 1.1, 2.0, 2.1, 3.0, 4.0, 4.1, "

@@ -20,8 +20,9 @@ inline constexpr TextView kDefaultInstallPath = u"C:\\Program Files\\Orvanne\\Te
 // create folders are ignored, a failure to open or write the file raises the file error.
 void appendErrorLog(int32_t number, TextView source, TextView description);
 
-// Writes one failed exchange: the request sent and the response received with their times.
-// A log over 512000 bytes (or empty, or missing) is started again. Never raises.
+// Writes one failed exchange: the request sent and the response received with their times,
+// each cut after 50000 characters with a note of how many were left out. A log over 512000
+// bytes (or empty, or missing) is started again. Never raises.
 void LogFailedExchange(TextView request, TextView response, const LocalTime& sent,
                        const LocalTime& received);
 

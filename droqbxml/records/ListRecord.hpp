@@ -65,7 +65,9 @@ inline constexpr auto kShortItemFields = joined(kShortHeader, kItemDesc);
 template <class Derived>
 class ListRecordOf : public RecordOf<Derived> {
  public:
-  static consteval bool has(std::u16string_view name) {
+  // constexpr rather than consteval: clang 14 refuses a consteval call in the if constexpr
+  // of a template's member before the template is instantiated.
+  static constexpr bool has(std::u16string_view name) {
     for (const auto& row : Derived::kFields) {
       if (row.name == name) return true;
     }

@@ -237,12 +237,27 @@ void readGroups(DroTxnLineGroupCol<Kind>& groups, const Text& Value, int32_t& St
   }
 }
 
-template class DroTxnLine<TxnKind::Estimate>;
-template class DroTxnLine<TxnKind::Invoice>;
+// Lines and line groups member by member: instantiating the whole class would also
+// instantiate the other kind's field accessors, whose constraints clang 14 does not honour
+// in an explicit instantiation.
+template const ClassInfo& DroTxnLine<TxnKind::Estimate>::typeInfo();
+template void DroTxnLine<TxnKind::Estimate>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLine<TxnKind::Estimate>::PrintOut() const;
+template void DroTxnLine<TxnKind::Estimate>::Class_Treminate();
+template const ClassInfo& DroTxnLine<TxnKind::Invoice>::typeInfo();
+template void DroTxnLine<TxnKind::Invoice>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLine<TxnKind::Invoice>::PrintOut() const;
+template void DroTxnLine<TxnKind::Invoice>::Class_Treminate();
+template const ClassInfo& DroTxnLineGroup<TxnKind::Estimate>::typeInfo();
+template Variant DroTxnLineGroup<TxnKind::Estimate>::IsEmpty() const;
+template void DroTxnLineGroup<TxnKind::Estimate>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLineGroup<TxnKind::Estimate>::PrintOut() const;
+template const ClassInfo& DroTxnLineGroup<TxnKind::Invoice>::typeInfo();
+template Variant DroTxnLineGroup<TxnKind::Invoice>::IsEmpty() const;
+template void DroTxnLineGroup<TxnKind::Invoice>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLineGroup<TxnKind::Invoice>::PrintOut() const;
 template class DroTxnLineCol<TxnKind::Estimate>;
 template class DroTxnLineCol<TxnKind::Invoice>;
-template class DroTxnLineGroup<TxnKind::Estimate>;
-template class DroTxnLineGroup<TxnKind::Invoice>;
 template class DroTxnLineGroupCol<TxnKind::Estimate>;
 template class DroTxnLineGroupCol<TxnKind::Invoice>;
 template void readGroups(DroTxnLineGroupCol<TxnKind::Estimate>&, const Text&, int32_t&, int32_t&);

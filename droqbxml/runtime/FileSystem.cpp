@@ -1,4 +1,5 @@
-// Path mapping, folder creation and text files with the platform's error numbers.
+// Path mapping, folder creation, text files and locked log files with the platform's error
+// numbers.
 #include "droqbxml/runtime/FileSystem.hpp"
 
 #include <bitset>
@@ -6,6 +7,15 @@
 #include <cstdlib>
 #include <string>
 #include <system_error>
+
+#ifdef _WIN32
+#include <windows.h>
+#else
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+#endif
 
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Utf.hpp"
@@ -29,7 +39,9 @@ std::filesystem::path driveRoot(char16_t letter) {
   return root / ".local" / "share" / "droqbxml" / (std::string("drive_") + lower);
 }
 
-bool hasDrive(TextView path) { return path.size() >= 2 && isDriveLetter(path[0]) && path[1] == u':'; }
+bool hasDrive(TextView path) {
+  return path.size() >= 2 && isDriveLetter(path[0]) && path[1] == u':';
+}
 
 // "\Logs" is the root of the current drive, which for the component is always C:.
 bool isDriveRelativeRoot(TextView path) {
@@ -136,6 +148,138 @@ void TextFile::write(TextView text) {
   }
 }
 
+#ifdef _WIN32
+
+namespace {
+
+HANDLE handleOf(std::intptr_t handle) { return reinterpret_cast<HANDLE>(handle); }
+
+[[noreturn]] void raiseForLastError() {
+  switch (GetLastError()) {
+    case ERROR_FILE_NOT_FOUND:
+    case ERROR_PATH_NOT_FOUND:
+      raiseRuntimeError(RuntimeError::kPathNotFound);
+    case ERROR_ACCESS_DENIED:
+    case ERROR_WRITE_PROTECT:
+      raiseRuntimeError(RuntimeError::kPermissionDenied);
+    case ERROR_INVALID_NAME:
+    case ERROR_FILENAME_EXCED_RANGE:
+      raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
+    default:
+      raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+}
+
+}  // namespace
+
+LockedLogFile::LockedLogFile(TextView path) {
+  if (path.empty()) raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
+  ensureDrive(path);
+  const auto mapped = mapPath(path);
+  std::error_code ignored;
+  if (std::filesystem::is_directory(mapped, ignored)) {
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+  const HANDLE file = CreateFileW(mapped.c_str(), GENERIC_WRITE,
+                                  FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                                  OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
+  if (file == INVALID_HANDLE_VALUE) raiseForLastError();
+  OVERLAPPED whole{};
+  if (!LockFileEx(file, LOCKFILE_EXCLUSIVE_LOCK, 0, MAXDWORD, MAXDWORD, &whole)) {
+    CloseHandle(file);
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+  handle_ = reinterpret_cast<std::intptr_t>(file);
+}
+
+LockedLogFile::~LockedLogFile() {
+  OVERLAPPED whole{};
+  UnlockFileEx(handleOf(handle_), 0, MAXDWORD, MAXDWORD, &whole);
+  CloseHandle(handleOf(handle_));
+}
+
+int64_t LockedLogFile::length() const {
+  LARGE_INTEGER size{};
+  if (!GetFileSizeEx(handleOf(handle_), &size)) return 0;
+  return static_cast<int64_t>(size.QuadPart);
+}
+
+void LockedLogFile::clear() {
+  if (!SetFilePointerEx(handleOf(handle_), LARGE_INTEGER{}, nullptr, FILE_BEGIN) ||
+      !SetEndOfFile(handleOf(handle_))) {
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+}
+
+void LockedLogFile::append(TextView text) {
+  const std::string bytes = toUtf8(text);
+  if (!SetFilePointerEx(handleOf(handle_), LARGE_INTEGER{}, nullptr, FILE_END)) {
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+  size_t written = 0;
+  while (written < bytes.size()) {
+    DWORD now = 0;
+    const size_t left = bytes.size() - written;
+    const DWORD chunk = left > (DWORD{1} << 30) ? DWORD{1} << 30 : static_cast<DWORD>(left);
+    if (!WriteFile(handleOf(handle_), bytes.data() + written, chunk, &now, nullptr) || now == 0) {
+      raiseRuntimeError(RuntimeError::kPathFileAccessError);
+    }
+    written += now;
+  }
+}
+
+#else
+
+LockedLogFile::LockedLogFile(TextView path) {
+  if (path.empty()) raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
+  ensureDrive(path);
+  const auto mapped = mapPath(path);
+  std::error_code ignored;
+  if (std::filesystem::is_directory(mapped, ignored)) {
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+  const int file = ::open(mapped.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666);
+  if (file < 0) raiseForErrno(errno);
+  int locked = 0;
+  do {
+    locked = ::flock(file, LOCK_EX);
+  } while (locked != 0 && errno == EINTR);
+  if (locked != 0) {
+    ::close(file);
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+  handle_ = file;
+}
+
+// Closing the file releases the lock.
+LockedLogFile::~LockedLogFile() { ::close(static_cast<int>(handle_)); }
+
+int64_t LockedLogFile::length() const {
+  struct stat status {};
+  if (::fstat(static_cast<int>(handle_), &status) != 0) return 0;
+  return static_cast<int64_t>(status.st_size);
+}
+
+void LockedLogFile::clear() {
+  if (::ftruncate(static_cast<int>(handle_), 0) != 0) {
+    raiseRuntimeError(RuntimeError::kPathFileAccessError);
+  }
+}
+
+void LockedLogFile::append(TextView text) {
+  const std::string bytes = toUtf8(text);
+  size_t written = 0;
+  while (written < bytes.size()) {
+    const ssize_t now =
+        ::write(static_cast<int>(handle_), bytes.data() + written, bytes.size() - written);
+    if (now < 0 && errno == EINTR) continue;
+    if (now <= 0) raiseRuntimeError(RuntimeError::kPathFileAccessError);
+    written += static_cast<size_t>(now);
+  }
+}
+
+#endif
+
 FileNumber FileNumber::take() {
   FileNumber taken;
   for (size_t n = 1; n < fileNumbersInUse.size(); ++n) {
@@ -152,9 +296,7 @@ FileNumber::~FileNumber() {
   if (number_ != 0) fileNumbersInUse.reset(static_cast<size_t>(number_));
 }
 
-FileNumber::FileNumber(FileNumber&& other) noexcept : number_(other.number_) {
-  other.number_ = 0;
-}
+FileNumber::FileNumber(FileNumber&& other) noexcept : number_(other.number_) { other.number_ = 0; }
 
 FileNumber& FileNumber::operator=(FileNumber&& other) noexcept {
   if (this != &other) {

@@ -48,6 +48,28 @@ class TextFile {
   std::unique_ptr<std::FILE, Closer> file_;
 };
 
+// A log file that several threads and processes append to at once: opened for appending
+// (created when missing) and locked exclusively while the object lives, so that a writer
+// decides from the length and writes its entry with no other writer in between, and every
+// entry reaches the file whole whatever its size. Open failures raise as TextFile's.
+class LockedLogFile {
+ public:
+  explicit LockedLogFile(TextView path);
+  ~LockedLogFile();
+  LockedLogFile(const LockedLogFile&) = delete;
+  LockedLogFile& operator=(const LockedLogFile&) = delete;
+
+  // The file's length in bytes.
+  int64_t length() const;
+  // Empties the file, for a log that starts again; a failure is 75.
+  void clear();
+  // Appends the text as UTF-8, all of it; a failed write is 75.
+  void append(TextView text);
+
+ private:
+  std::intptr_t handle_;  // a file descriptor, or on Windows a HANDLE
+};
+
 // A file number of this thread's pool (1..511), held while the object lives.
 class FileNumber {
  public:

@@ -1,4 +1,5 @@
-// UTF-16 to UTF-8 and back, replacing whatever cannot be converted by U+FFFD.
+// UTF-16 to UTF-8 and back, replacing whatever cannot be converted by U+FFFD, and the
+// check for well-formed UTF-8.
 #include "droqbxml/runtime/Utf.hpp"
 
 #include <cstdint>
@@ -194,6 +195,38 @@ Text fromUtf8(std::string_view utf8) {
   }
   out.resize(static_cast<size_t>(dst - out.data()));
   return out;
+}
+
+std::size_t firstInvalidUtf8(std::string_view utf8) {
+  std::size_t i = 0;
+  while (i < utf8.size()) {
+    const auto lead = static_cast<unsigned char>(utf8[i]);
+    if (lead < 0x80) {
+      ++i;
+      continue;
+    }
+    std::size_t length = 0;
+    char32_t code = 0;
+    char32_t least = 0;
+    if ((lead & 0xE0) == 0xC0) {
+      length = 2, code = lead & 0x1F, least = 0x80;
+    } else if ((lead & 0xF0) == 0xE0) {
+      length = 3, code = lead & 0x0F, least = 0x800;
+    } else if ((lead & 0xF8) == 0xF0) {
+      length = 4, code = lead & 0x07, least = 0x10000;
+    } else {
+      return i;
+    }
+    if (i + length > utf8.size()) return i;
+    for (std::size_t k = 1; k < length; ++k) {
+      const auto next = static_cast<unsigned char>(utf8[i + k]);
+      if ((next & 0xC0) != 0x80) return i;
+      code = (code << 6) | (next & 0x3F);
+    }
+    if (code < least || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF)) return i;
+    i += length;
+  }
+  return std::string_view::npos;
 }
 
 }  // namespace droqbxml

@@ -115,14 +115,16 @@ void appendField(std::string& out, const Field& field, Store& store) {
 }  // namespace
 
 QbxmlVersion QbxmlVersion::parse(std::string_view text) {
+  // Held below 10000 so that no run of digits overflows; every known version is far below.
+  constexpr int kCeiling = 10000;
   QbxmlVersion version{0, 0};
   size_t i = 0;
   for (; i < text.size() && text[i] >= '0' && text[i] <= '9'; ++i) {
-    version.major = version.major * 10 + (text[i] - '0');
+    version.major = std::min(version.major * 10 + (text[i] - '0'), kCeiling);
   }
   if (i < text.size() && text[i] == '.') {
     for (++i; i < text.size() && text[i] >= '0' && text[i] <= '9'; ++i) {
-      version.minor = version.minor * 10 + (text[i] - '0');
+      version.minor = std::min(version.minor * 10 + (text[i] - '0'), kCeiling);
     }
   }
   return version.major == 0 ? QbxmlVersion{} : version;

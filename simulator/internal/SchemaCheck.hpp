@@ -54,6 +54,10 @@ struct ValueRefusalProblem {
 };
 std::optional<ValueRefusalProblem> refusedValue(const Particle& leaf, std::string_view text);
 
+// Whether QuickBooks Desktop answers documents of this qbXML version ("1.0" ... "13.0",
+// spelt exactly so).
+bool isKnownVersion(std::string_view version);
+
 // The qbXML version a document is read as, times ten (130 for 13.0), and how it was
 // declared (for messages).
 struct DeclaredVersion {

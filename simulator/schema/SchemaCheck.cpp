@@ -296,7 +296,9 @@ class TreeChecker {
 
   void checkAttributes(const XmlNode& node, const AggregateRule& rule) {
     const auto rules = attributesOf(rule);
-    for (const auto& [name, value] : node.attributes) {
+    for (const auto& attribute : node.attributes) {
+      const std::string& name = attribute.first;
+      const std::string& value = attribute.second;
       const auto found = std::find_if(rules.begin(), rules.end(),
                                       [&](const AttributeRule& r) { return r.name == name; });
       if (found == rules.end()) {

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <sstream>
+#include <stdexcept>
 
 #include "cli/Cli.hpp"
 #include "droqbxml/connection/RequestProcessor.hpp"
@@ -139,12 +140,29 @@ TEST_F(CliTest, ConnectionAndSessionFailuresExitWith3) {
             "(0x80040401)\n");
 }
 
-TEST_F(CliTest, UnreadableRequestFileIsAUsageError) {
+TEST_F(CliTest, UnreadableOrOversizedRequestFileIsAUsageError) {
   const Result result = run({"--processor", "Test.FakeProcessor", "send",
                              drive_.path("none.xml").string(), "--company", "C:\\co.qbw"});
   EXPECT_EQ(result.code, cli::kExitUsage);
   EXPECT_NE(result.err.find("cannot read the request document"), std::string::npos);
+  // One byte more than a request may have (a sparse file): refused, read no further.
+  const auto large = drive_.path("large.xml");
+  test::writeFile(large, "");
+  std::filesystem::resize_file(large, 100 * 1024 * 1024 + 1);
+  const Result lint = run({"lint", large.string()});
+  EXPECT_EQ(lint.code, cli::kExitUsage);
+  EXPECT_EQ(lint.err,
+            "droqbxml: the request document \"" + large.string() +
+                "\" has more than 104857600 bytes, the most a request may have (100 MB)\n");
   EXPECT_TRUE(fake_->calls.empty());
+}
+
+// A failure nothing foresaw still ends the command with one line and a documented code.
+TEST_F(CliTest, AnUnexpectedFailureIsOneLineAndExitCode3) {
+  fake_->process = [](const Text&) -> Text { throw std::runtime_error("the disk is on fire"); };
+  const Result result = send({});
+  EXPECT_EQ(result.code, cli::kExitConnection);
+  EXPECT_EQ(result.err, "droqbxml: unexpected failure: the disk is on fire\n");
 }
 
 }  // namespace

@@ -1,5 +1,13 @@
-// The error log and the failed-exchange log, byte for byte.
+// The error log and the failed-exchange log, byte for byte, and whole when processes write
+// them at once.
 #include <gtest/gtest.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <string>
 
 #include "droqbxml/component/basGlobals.hpp"
 #include "droqbxml/diagnostics/Logs.hpp"
@@ -88,6 +96,82 @@ TEST_F(LogsTest, FailedExchangeLogNeedsAFreeFileNumber) {
   for (int i = 0; i < 511; ++i) held.push_back(FileNumber::take());
   LogFailedExchange(u"a", u"b", kZeroDate, kZeroDate);
   EXPECT_FALSE(std::filesystem::exists(drive_.path("T/Logs")));
+}
+
+// One exchange keeps at most 50000 characters of its request and of its response, each cut
+// with a note of what was left out; a surrogate pair at the cut stays whole.
+TEST_F(LogsTest, FailedExchangeKeepsTheStartOfALongRequestAndResponse) {
+  clsAppPathAccess().Apppath(u"C:\\T");
+  createFolder(u"C:\\T");
+  LogFailedExchange(Text(49999, u'q') + u"\U0001F600" + Text(150000, u'q'), Text(1000000, u'r'),
+                    kZeroDate, kZeroDate);
+  const std::string log = readFile(drive_.path("T/Logs/qbXmlErrors/qbXML-Error.txt"));
+  EXPECT_LT(log.size(), 110000u);
+  EXPECT_NE(log.find(std::string(49999, 'q') + "... [150002 characters left out]\r\n"), log.npos);
+  EXPECT_NE(log.find(std::string(50000, 'r') + "... [950000 characters left out]\r\n"), log.npos);
+}
+
+// Entry `seq` of writer `writer`: "#writer-seq:" and up to 32 KB of one letter, so that a torn
+// or mixed entry cannot pass for a whole one; an exchange sends and receives it.
+Text entryText(int writer, int seq) {
+  const size_t letters =
+      (static_cast<size_t>(writer) * 7919 + static_cast<size_t>(seq) * 104729) % 32758;
+  return fromUtf8("#" + std::to_string(writer) + "-" + std::to_string(seq) + ":" +
+                  std::string(letters, static_cast<char>('a' + (writer + seq) % 26)));
+}
+
+// Eight processes logging at once in eight bursts, entries of 10 bytes to 64 KB: each log is
+// made of entries exactly as one process alone writes them (the failed-exchange log, started
+// again on the way, checked after each burst). DROQBXML_LOG_ROUNDS sets the entries per
+// process and burst (6; more for a long run).
+TEST_F(LogsTest, EntriesOfProcessesWritingAtOnceStayWhole) {
+  const char* configured = std::getenv("DROQBXML_LOG_ROUNDS");
+  const int rounds = configured ? std::atoi(configured) : 6;
+  const auto write = [](const Text& text) {
+    appendErrorLog(0, u"writer", text);
+    LogFailedExchange(text, text, kZeroDate, kZeroDate);
+  };
+  const std::string logs[] = {"/Logs/ErrorLog.txt", "/Logs/qbXmlErrors/qbXML-Error.txt"};
+  const std::string kFive = "\r\n\r\n\r\n\r\n\r\n";
+  clsAppPathAccess().Apppath(u"C:\\Alone");
+  createFolder(u"C:\\Alone");
+  write(u"@");  // the logs as one process alone writes an entry of "@"
+  const std::string alone[] = {readFile(drive_.path("Alone" + logs[0])),
+                               readFile(drive_.path("Alone" + logs[1])) + kFive};
+  clsAppPathAccess().Apppath(u"C:\\Shared");
+  createFolder(u"C:\\Shared");
+  for (int burst = 0; burst < 8; ++burst) {
+    int start[2];  // the writers start together when it closes
+    ASSERT_EQ(::pipe(start), 0);
+    for (int writer = 0; writer < 8; ++writer) {
+      if (::fork() != 0) continue;
+      ::close(start[1]);
+      if (char none = 0; ::read(start[0], &none, 1) != 0) ::_exit(1);
+      for (int seq = burst * rounds; seq < (burst + 1) * rounds; ++seq) {
+        write(entryText(writer, seq));
+      }
+      ::_exit(0);
+    }
+    ::close(start[1]);
+    ::close(start[0]);
+    for (int status = 0; ::wait(&status) > 0;) EXPECT_EQ(status, 0);
+    for (size_t log = burst < 7 ? 1 : 0; log < 2; ++log) {
+      const std::string text = readFile(drive_.path("Shared" + logs[log])) + (log ? kFive : "");
+      for (size_t at = 0, next = 0; at < text.size(); at = next) {
+        next = text.find(log ? "SENDING" : "Error", at + 1);
+        const std::string piece = text.substr(at, next - at);
+        int writer = -1;
+        int seq = -1;
+        std::sscanf(piece.c_str() + std::min(piece.find('#'), piece.size()), "#%d-%d", &writer,
+                    &seq);
+        std::string expected = alone[log];
+        for (size_t found = 0; (found = expected.find('@')) != std::string::npos;) {
+          expected.replace(found, 1, toUtf8(entryText(writer, seq)));
+        }
+        ASSERT_TRUE(piece == expected) << logs[log] << ": " << piece.substr(0, 60);
+      }
+    }
+  }
 }
 
 }  // namespace

@@ -11,6 +11,7 @@
 
 #include "simulator/CompanyFile.hpp"
 #include "tests/TestSupport.hpp"
+#include "tests/cli/CliRunner.hpp"
 #include "tests/simulator/CompanyFileSupport.hpp"
 
 namespace droqbxml::simulator {
@@ -69,12 +70,30 @@ TEST(CompanyFileTest, CreateKeepsTheSettingsAndRefusesAnExistingPath) {
   EXPECT_EQ(failure([&] { CompanyFile::create(folder / "no-such-folder" / "a.qbw", {}); }),
             Kind::Missing);
 
-  // A half-made file is removed: here a folder where SQLite's journal must go makes the
-  // creating transaction fail.
-  std::filesystem::create_directory(folder / "half.qbw-journal");
+  // A half-made file is removed: here a folder where SQLite's journal of the file being built
+  // must go makes the creating transaction fail.
+  const auto building = folder / (".half.qbw." + std::to_string(::getpid()) + "-0.building");
+  std::filesystem::create_directory(building.string() + "-journal");
   EXPECT_THROW(CompanyFile::create(folder / "half.qbw", {}), std::runtime_error);
   EXPECT_FALSE(std::filesystem::exists(folder / "half.qbw"));
-  EXPECT_TRUE(std::filesystem::is_directory(folder / "half.qbw-journal"));
+  EXPECT_FALSE(std::filesystem::exists(building));
+  EXPECT_TRUE(std::filesystem::is_directory(building.string() + "-journal"));
+}
+
+// A process killed while it creates a company file (here as soon as the name appears) leaves
+// the whole file or none of that name, which can then be created afresh.
+TEST(CompanyFileTest, ACreationKilledHalfwayLeavesTheWholeFileOrNone) {
+  test::TemporaryFolder folder;
+  for (int round = 0; round < 5; ++round) {
+    const auto path = folder / ("killed" + std::to_string(round) + ".qbw");
+    const pid_t child = test::startChild([&] { return CompanyFile::create(path, {}), 0; });
+    bool running = true;
+    while (!std::filesystem::exists(path) && (running = ::waitpid(child, nullptr, WNOHANG) == 0)) {
+    }
+    if (running && ::kill(child, SIGKILL) == 0) test::finishChild(child);
+    EXPECT_FALSE(std::filesystem::exists(path) ? openFailure(path)
+                                               : failure([&] { CompanyFile::create(path, {}); }));
+  }
 }
 
 TEST(CompanyFileTest, OpenTellsMissingForeignAndDamagedFilesApart) {
@@ -108,6 +127,7 @@ TEST(CompanyFileTest, OpenTellsMissingForeignAndDamagedFilesApart) {
   for (const auto& [path, kind] : cases) EXPECT_EQ(openFailure(path), kind) << path;
 }
 
+// A file this user may not change is refused for changes, and read alone it can be shown.
 TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
   test::TemporaryFolder folder;
   const auto path = folder / "locked.qbw";
@@ -121,11 +141,12 @@ TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
     perms folder;
     perms file;
     int expected;
+    int shown;
   } cases[] = {
-      {perms::all, perms::all, kOpens},
-      {perms::all, kReadable, static_cast<int>(Kind::ReadOnly)},
-      {kListable, perms::all, static_cast<int>(Kind::ReadOnly)},
-      {perms::all, perms::none, static_cast<int>(Kind::Unreadable)},
+      {perms::all, perms::all, kOpens, cli::kExitSuccess},
+      {perms::all, kReadable, static_cast<int>(Kind::ReadOnly), cli::kExitSuccess},
+      {kListable, perms::all, static_cast<int>(Kind::ReadOnly), cli::kExitSuccess},
+      {perms::all, perms::none, static_cast<int>(Kind::Unreadable), cli::kExitConnection},
   };
   for (const auto& c : cases) {
     std::filesystem::permissions(folder.root(), c.folder);
@@ -136,6 +157,10 @@ TEST(CompanyFileTest, OpenRefusesAFileThatCannotBeWritten) {
     });
     if (result == test::kCannotDropRights) GTEST_SKIP() << "cannot run as an ordinary user";
     EXPECT_EQ(result, c.expected);
+    EXPECT_EQ(test::runUnprivileged([&] {
+                return test::runCli({"company", "show", path.string()}).code;
+              }),
+              c.shown);
   }
 }
 

@@ -343,9 +343,9 @@ TEST_F(RequestHandlersTest, TextIsKeptInIso88591AndOlderVersionsGetOnlyTheirElem
   runTable("text_and_versions.txt");
 }
 
-// QuickBooks refuses rollbackOnError outright, before doing anything: the reader already
-// does, and a document that got past it anyway is refused whole.
-TEST_F(RequestHandlersTest, RollbackOnErrorIsRefusedWhole) {
+// QuickBooks refuses rollbackOnError and versions it does not know outright, before doing
+// anything: the reader already does, and a document that got past it anyway is refused whole.
+TEST_F(RequestHandlersTest, RollbackOnErrorAndUnknownVersionsAreRefusedWhole) {
   const std::string requests = rq("CustomerAdd{Name=Acme};CustomerAdd{Name=Bolt}");
   ReadResult read = readRequest(document(requests, "rollbackOnError", kVersion13));
   EXPECT_FALSE(read.document);
@@ -356,6 +356,11 @@ TEST_F(RequestHandlersTest, RollbackOnErrorIsRefusedWhole) {
                            static_cast<int32_t>(0x80040400u), u"QBXMLRP.RequestProcessor.1",
                            u"QuickBooks found an error when parsing the provided XML text "
                            u"stream."));
+  read.document->root.children[0].attributes[0].second = "continueOnError";
+  for (const char* version : {"99999999999.0", "13.99999999999", "14.0", ""}) {
+    read.document->qbxmlVersion = version;
+    EXPECT_THROW(answerRequests(company(), *read.document), ComError) << version;
+  }
   EXPECT_NE(answer(rq("CustomerQuery{}")).find("statusCode=\"1\""), std::string::npos);
 }
 
