@@ -65,7 +65,9 @@ inline constexpr auto kShortItemFields = joined(kShortHeader, kItemDesc);
 template <class Derived>
 class ListRecordOf : public RecordOf<Derived> {
  public:
-  static consteval bool has(std::u16string_view name) {
+  // constexpr, not consteval: clang before 15 evaluates a consteval call in a template
+  // before Derived, and so its table, is complete.
+  static constexpr bool has(std::u16string_view name) {
     for (const auto& row : Derived::kFields) {
       if (row.name == name) return true;
     }

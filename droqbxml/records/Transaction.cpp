@@ -237,12 +237,26 @@ void readGroups(DroTxnLineGroupCol<Kind>& groups, const Text& Value, int32_t& St
   }
 }
 
-template class DroTxnLine<TxnKind::Estimate>;
-template class DroTxnLine<TxnKind::Invoice>;
+// The line and group members defined here, kind by kind: clang before 15 would instantiate
+// with the whole class also the members of the other kind, which this kind's table lacks.
+template const ClassInfo& DroTxnLine<TxnKind::Estimate>::typeInfo();
+template void DroTxnLine<TxnKind::Estimate>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLine<TxnKind::Estimate>::PrintOut() const;
+template void DroTxnLine<TxnKind::Estimate>::Class_Treminate();
+template const ClassInfo& DroTxnLine<TxnKind::Invoice>::typeInfo();
+template void DroTxnLine<TxnKind::Invoice>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLine<TxnKind::Invoice>::PrintOut() const;
+template void DroTxnLine<TxnKind::Invoice>::Class_Treminate();
 template class DroTxnLineCol<TxnKind::Estimate>;
 template class DroTxnLineCol<TxnKind::Invoice>;
-template class DroTxnLineGroup<TxnKind::Estimate>;
-template class DroTxnLineGroup<TxnKind::Invoice>;
+template const ClassInfo& DroTxnLineGroup<TxnKind::Estimate>::typeInfo();
+template Variant DroTxnLineGroup<TxnKind::Estimate>::IsEmpty() const;
+template void DroTxnLineGroup<TxnKind::Estimate>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLineGroup<TxnKind::Estimate>::PrintOut() const;
+template const ClassInfo& DroTxnLineGroup<TxnKind::Invoice>::typeInfo();
+template Variant DroTxnLineGroup<TxnKind::Invoice>::IsEmpty() const;
+template void DroTxnLineGroup<TxnKind::Invoice>::ParseRs(const Text&, int32_t&, int32_t&);
+template Text DroTxnLineGroup<TxnKind::Invoice>::PrintOut() const;
 template class DroTxnLineGroupCol<TxnKind::Estimate>;
 template class DroTxnLineGroupCol<TxnKind::Invoice>;
 template void readGroups(DroTxnLineGroupCol<TxnKind::Estimate>&, const Text&, int32_t&, int32_t&);

@@ -297,8 +297,11 @@ class TreeChecker {
   void checkAttributes(const XmlNode& node, const AggregateRule& rule) {
     const auto rules = attributesOf(rule);
     for (const auto& [name, value] : node.attributes) {
-      const auto found = std::find_if(rules.begin(), rules.end(),
-                                      [&](const AttributeRule& r) { return r.name == name; });
+      // Named, not captured as a binding: clang before 16 refuses lambdas capturing those.
+      const std::string& attributeName = name;
+      const auto found = std::find_if(rules.begin(), rules.end(), [&](const AttributeRule& r) {
+        return r.name == attributeName;
+      });
       if (found == rules.end()) {
         report(node.line, "unknown attribute '" + name + "' on " + node.name);
         continue;
