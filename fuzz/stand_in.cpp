@@ -1,6 +1,7 @@
 // The whole stand-in answering arbitrary request documents in a session on a real company
-// file (made once per process on a memory file system, and put back as it was made every
-// few thousand documents so that the lists stay small). A document QuickBooks will not read
+// file (made once per process on a memory file system, with the customers and items the
+// seed requests name, and put back as it was made every few thousand documents so that the
+// lists stay small). A document QuickBooks will not read
 // fails with its parse error; any other failure, or anything but a ComError, is a finding. Every
 // answer must be a well-formed response document in which each response carries its status code,
 // severity and message.
@@ -11,6 +12,7 @@
 #include <filesystem>
 #include <memory>
 #include <string>
+#include <string_view>
 
 #include "droqbxml/runtime/Utf.hpp"
 #include "fuzz/FuzzSupport.hpp"
@@ -22,29 +24,64 @@ namespace {
 
 constexpr int kDocumentsPerCompanyFile = 5000;
 
+// What the company holds before the first document: the names the seed requests use.
+constexpr std::string_view kLists =
+    "<?xml version=\"1.0\"?><?qbxml version=\"13.0\"?><QBXML>"
+    "<QBXMLMsgsRq onError=\"stopOnError\">"
+    "<CustomerAddRq><CustomerAdd><Name>A</Name></CustomerAdd></CustomerAddRq>"
+    "<CustomerAddRq><CustomerAdd><Name>Kim Lee</Name></CustomerAdd></CustomerAddRq>"
+    "<CustomerAddRq><CustomerAdd><Name>Lee &amp; Daughters</Name></CustomerAdd></CustomerAddRq>"
+    "<CustomerAddRq><CustomerAdd><Name>Kitchen</Name><ParentRef><FullName>Lee &amp; "
+    "Daughters</FullName></ParentRef></CustomerAdd></CustomerAddRq>"
+    "<ItemServiceAddRq><ItemServiceAdd><Name>Labour</Name><SalesOrPurchase><Price>85.00</Price>"
+    "<AccountRef><FullName>Sales</FullName></AccountRef></SalesOrPurchase></ItemServiceAdd>"
+    "</ItemServiceAddRq>"
+    "<ItemServiceAddRq><ItemServiceAdd><Name>Labor</Name><SalesOrPurchase><Price>60.00</Price>"
+    "<AccountRef><FullName>Sales</FullName></AccountRef></SalesOrPurchase></ItemServiceAdd>"
+    "</ItemServiceAddRq>"
+    "<ItemInventoryAddRq><ItemInventoryAdd><Name>Tile</Name><SalesPrice>4.50</SalesPrice>"
+    "<IncomeAccountRef><FullName>Sales</FullName></IncomeAccountRef><COGSAccountRef>"
+    "<FullName>Cost of Goods Sold</FullName></COGSAccountRef><AssetAccountRef><FullName>"
+    "Inventory Asset</FullName></AssetAccountRef></ItemInventoryAdd></ItemInventoryAddRq>"
+    "<ItemSubtotalAddRq><ItemSubtotalAdd><Name>Sub</Name></ItemSubtotalAdd></ItemSubtotalAddRq>"
+    "<ItemGroupAddRq><ItemGroupAdd><Name>Kit</Name><ItemGroupLine><ItemRef><FullName>Tile"
+    "</FullName></ItemRef><Quantity>4</Quantity></ItemGroupLine></ItemGroupAdd>"
+    "</ItemGroupAddRq>"
+    "</QBXMLMsgsRq></QBXML>";
+
 class Session {
  public:
   Session() : made_(scratchFolder() / "made.qbw"), company_(scratchFolder() / "company.qbw") {
     simulator::CompanySettings settings;
     settings.allowedApplications = {"Fuzz"};
     simulator::CompanyFile::create(made_, settings);
-    begin();
+    begin(made_);
+    const std::string answer = toUtf8(processor_->ProcessRequest(ticket_, fromUtf8(kLists)));
+    require(answer.find("statusCode=\"0\"") != std::string::npos &&
+                answer.find("statusSeverity=\"Error\"") == std::string::npos,
+            "the company's lists are added", answer);
+    processor_->EndSession(ticket_);
+    begin(company_);
   }
 
   Text answer(const Text& request) {
     if (++documents_ % kDocumentsPerCompanyFile == 0) {
       processor_->EndSession(ticket_);
-      begin();
+      begin(company_);
     }
     return processor_->ProcessRequest(ticket_, request);
   }
 
  private:
-  void begin() {
-    std::filesystem::copy_file(made_, company_, std::filesystem::copy_options::overwrite_existing);
+  // A session on `file`; the working company file starts again as it was made.
+  void begin(const std::filesystem::path& file) {
+    if (file == company_) {
+      std::filesystem::copy_file(made_, company_,
+                                 std::filesystem::copy_options::overwrite_existing);
+    }
     processor_ = simulator::createProcessor();
     processor_->OpenConnection(u"", u"Fuzz");
-    ticket_ = processor_->BeginSession(fromUtf8(company_.string()), qbFileOpenDoNotCare);
+    ticket_ = processor_->BeginSession(fromUtf8(file.string()), qbFileOpenDoNotCare);
   }
 
   std::filesystem::path made_;
