@@ -1,6 +1,6 @@
 # The two commands a new machine needs: `make test` and `make demo`. Both install any
 # missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
-.PHONY: all setup test fuzz bench demo com com-test fault-check format clean
+.PHONY: all setup test survival fuzz bench demo com com-test fault-check format clean
 
 all: test
 
@@ -16,6 +16,13 @@ test: setup
 	cmake --preset ordinary
 	cmake --build --preset ordinary
 	ctest --preset ordinary
+
+# The company file test in its long form (part of make test in a short one): a thousand
+# adds killed at random points, two and four adders of 250 adds each at once.
+survival: setup
+	cmake --preset test
+	cmake --build --preset test
+	DROQBXML_FULL_SURVIVAL=1 ctest --preset test -R company_file_survives
 
 # The libFuzzer targets (clang, sanitizers; build/fuzz), each run for FUZZ_SECONDS, two at a
 # time at the lowest priority; the corpora stay in build/fuzz/corpus for the next run.
