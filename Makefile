@@ -1,6 +1,6 @@
 # The two commands a new machine needs: `make test` and `make demo`. Both install any
 # missing Debian package first (scripts/setup-deps.sh); CMake presets hold the builds.
-.PHONY: all setup test bench demo com com-test fault-check clang-check log-stress format clean
+.PHONY: all setup test survival fuzz bench demo com com-test fault-check clang-check log-stress format clean
 
 all: test
 
@@ -16,6 +16,22 @@ test: setup
 	cmake --preset ordinary
 	cmake --build --preset ordinary
 	ctest --preset ordinary
+
+# The company file test in its long form (part of make test in a short one): a thousand
+# adds killed at random points, two and four adders of 250 adds each at once.
+survival: setup
+	cmake --preset test
+	cmake --build --preset test
+	DROQBXML_FULL_SURVIVAL=1 ctest --preset test -R company_file_survives
+
+# The libFuzzer targets (clang, sanitizers; build/fuzz), each run for FUZZ_SECONDS, two at a
+# time at the lowest priority; the corpora stay in build/fuzz/corpus for the next run.
+FUZZ_SECONDS ?= 60
+fuzz:
+	@bash scripts/setup-deps.sh fuzz
+	cmake --preset fuzz
+	cmake --build --preset fuzz
+	bash scripts/fuzz.sh $(FUZZ_SECONDS)
 
 # One table of the speed targets against what this machine measures (some minutes; run it
 # on a quiet machine).

@@ -1,13 +1,18 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that building, testing and benchmarking need and that this
 # machine lacks. Shared by the Makefile and .ci/run; does nothing when all are present.
-# `setup-deps.sh com` adds what the Windows COM server and its Wine tests need.
+# `setup-deps.sh com` adds what the Windows COM server and its Wine tests need;
+# `setup-deps.sh fuzz` clang and libFuzzer's runtime for the fuzz targets.
 set -euo pipefail
 
 packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev
-  libsqlite3-dev libexpat1-dev libxml2-utils libpugixml-dev nlohmann-json3-dev pkg-config)
+  libsqlite3-dev libexpat1-dev libxml2-utils libpugixml-dev nlohmann-json3-dev pkg-config
+  python3)
 if [ "${1:-}" = com ]; then
   packages+=(wine wine64 g++-mingw-w64-x86-64 mingw-w64-tools libwine-dev)
+fi
+if [ "${1:-}" = fuzz ]; then
+  packages+=(clang libclang-rt-dev)
 fi
 
 missing=()
