@@ -95,13 +95,14 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings) {
   handlers::addStandardLists(store, settings, handlers::currentTime());
 }
 
-std::string answerRequests(CompanyFile& company, const RequestDocument& document) {
+std::string answerRequests(CompanyFile& company, const RequestDocument& document,
+                           handlers::StatementCache* kept) {
   const XmlNode* messages = document.root.child("QBXMLMsgsRq");
   if (messages == nullptr) refuseDocument();
   const std::string onError = messages->attribute("onError").value_or("stopOnError");
   if (onError == "rollbackOnError") refuseDocument();
 
-  handlers::Store store(company.db());
+  handlers::Store store(company.db(), kept);
   handlers::Context context(company, store, handlers::QbxmlVersion::parse(document.qbxmlVersion));
   std::string answers;
   for (std::size_t index = 0; index < messages->children.size(); ++index) {

@@ -73,8 +73,8 @@ constexpr int64_t kListIdBase = 0x80000000;
 }  // namespace
 
 Statement::Statement(sqlite3* db, std::string_view sql) : db_(db) {
-  const int result =
-      sqlite3_prepare_v2(db, sql.data(), static_cast<int>(sql.size()), &statement_, nullptr);
+  const int result = sqlite3_prepare_v3(db, sql.data(), static_cast<int>(sql.size()),
+                                        SQLITE_PREPARE_PERSISTENT, &statement_, nullptr);
   if (result != SQLITE_OK) failSqlite(db, result);
 }
 
@@ -209,19 +209,29 @@ std::optional<std::pair<int64_t, int64_t>> parseTxnId(std::string_view text) {
   return parseIdentifier(text);
 }
 
-Store::Store(sqlite3* db) : db_(db) {}
+StatementCache::StatementCache(sqlite3* db) : db_(db) {}
 
-Store::~Store() = default;
+StatementCache::~StatementCache() = default;
 
-Statement& Store::statement(const std::string& sql) {
+Statement& StatementCache::statement(const std::string& sql) {
   auto& slot = statements_[sql];
   if (!slot) slot = std::make_unique<Statement>(db_, sql);
   return slot->reset();
 }
 
-void Store::resetStatements() {
+void StatementCache::resetAll() {
   for (auto& [sql, statement] : statements_) statement->reset();
 }
+
+Store::Store(sqlite3* db, StatementCache* kept)
+    : own_(kept != nullptr ? nullptr : std::make_unique<StatementCache>(db)),
+      statements_(kept != nullptr ? *kept : *own_) {}
+
+Store::~Store() { statements_.resetAll(); }
+
+Statement& Store::statement(const std::string& sql) { return statements_.statement(sql); }
+
+void Store::resetStatements() { statements_.resetAll(); }
 
 std::string_view Store::tableName(ListTable table) {
   switch (table) {
@@ -283,7 +293,7 @@ int64_t Store::insertList(ListTable table, ListRecord& record) {
       .bind(8, centsOrNull(record.openingBalance))
       .bindBlob(9, encodeFields(record.fields));
   insert.step();
-  record.id = sqlite3_last_insert_rowid(db_);
+  record.id = sqlite3_last_insert_rowid(db());
   return record.id;
 }
 

@@ -15,6 +15,7 @@
 #include "droqbxml/runtime/Text.hpp"
 #include "simulator/CompanyFile.hpp"
 #include "simulator/RequestDocument.hpp"
+#include "simulator/handlers/Store.hpp"
 
 namespace droqbxml::simulator::internal {
 
@@ -66,6 +67,8 @@ class SimulatedProcessor final : public RequestProcessor {
   struct Session {
     Text path;  // as the session was begun with, or the open file's path for an empty one
     std::unique_ptr<CompanyFile> company;
+    // Prepared on the company file's connection for the session's requests; ends before it.
+    std::unique_ptr<handlers::StatementCache> statements;
   };
 
   void requireConnection() const;
