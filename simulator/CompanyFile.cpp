@@ -288,7 +288,10 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
   db_ = db.release();
 }
 
-CompanyFile::~CompanyFile() { sqlite3_close_v2(db_); }
+CompanyFile::~CompanyFile() {
+  sqlite3_finalize(counter_);
+  sqlite3_close_v2(db_);
+}
 
 CompanySettings CompanyFile::settings() const {
   CompanySettings settings;
@@ -318,14 +321,26 @@ void CompanyFile::inTransaction(const std::function<void()>& work) {
   }
 }
 
-int64_t CompanyFile::nextCounter(std::string_view counter) {
-  Statement next(db_,
-                 "INSERT INTO counters (name, value) VALUES (?, 1) "
-                 "ON CONFLICT (name) DO UPDATE SET value = value + 1 RETURNING value");
-  next.bind(1, counter);
-  if (!next.step()) failSqlite(db_, SQLITE_ERROR, "nextCounter");
-  const int64_t value = next.integer(0);
-  next.step();
+int64_t CompanyFile::nextCounter(std::string_view counter, int64_t count) {
+  static constexpr std::string_view kNext =
+      "INSERT INTO counters (name, value) VALUES (?1, ?2) "
+      "ON CONFLICT (name) DO UPDATE SET value = value + ?2 RETURNING value - ?2 + 1";
+  if (counter_ == nullptr) {
+    const int prepared = sqlite3_prepare_v3(db_, kNext.data(), static_cast<int>(kNext.size()),
+                                            SQLITE_PREPARE_PERSISTENT, &counter_, nullptr);
+    if (prepared != SQLITE_OK) failSqlite(db_, prepared, kNext);
+  }
+  // Rewound however it ends, so that the statement holds nothing between calls.
+  const std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)> rewind(counter_, sqlite3_reset);
+  sqlite3_bind_text(counter_, 1, counter.data(), static_cast<int>(counter.size()),
+                    SQLITE_TRANSIENT);
+  sqlite3_bind_int64(counter_, 2, count);
+  int result = sqlite3_step(counter_);
+  if (result == SQLITE_DONE) failSqlite(db_, SQLITE_ERROR, "nextCounter");
+  if (result != SQLITE_ROW) failSqlite(db_, result, kNext);
+  const int64_t value = sqlite3_column_int64(counter_, 0);
+  result = sqlite3_step(counter_);
+  if (result != SQLITE_DONE) failSqlite(db_, result, kNext);
   return value;
 }
 

@@ -15,6 +15,7 @@
 #include <vector>
 
 struct sqlite3;
+struct sqlite3_stmt;
 
 namespace droqbxml::simulator {
 
@@ -73,8 +74,9 @@ class CompanyFile {
   void inTransaction(const std::function<void()>& work);
 
   // The next value of a named counter kept in the file (1, 2, ...), for list and
-  // transaction identifiers and numbers. Call it inside a transaction.
-  int64_t nextCounter(std::string_view counter);
+  // transaction identifiers and numbers; with `count`, the first of that many consecutive
+  // values, all taken. Call it inside a transaction.
+  int64_t nextCounter(std::string_view counter, int64_t count = 1);
 
   // The integrated-application list, by exact application name: nothing for an application
   // the file has not seen. setApplication adds or changes an entry in its own transaction.
@@ -88,6 +90,7 @@ class CompanyFile {
  private:
   std::filesystem::path path_;
   sqlite3* db_ = nullptr;
+  sqlite3_stmt* counter_ = nullptr;  // nextCounter's, prepared on first use and kept
 };
 
 }  // namespace droqbxml::simulator

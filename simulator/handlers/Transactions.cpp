@@ -405,8 +405,10 @@ Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
   setField(txn.fields, Field::value("SalesTaxPercentage", formatNumber(rate, NumberKind::Percent)));
   if (kind.invoice) txn.balance = txn.subtotal + txn.salesTax;
 
-  txn.id = context.company.nextCounter("TxnID");
-  for (TxnLine& line : lines.lines()) line.id = context.company.nextCounter("TxnID");
+  // The transaction's TxnID number, then its lines' in order.
+  txn.id = context.company.nextCounter("TxnID", 1 + static_cast<int64_t>(lines.lines().size()));
+  int64_t lineId = txn.id;
+  for (TxnLine& line : lines.lines()) line.id = ++lineId;
   txn.number = context.company.nextCounter("TxnNumber");
   txn.created = context.now;
   txn.modified = context.now;
