@@ -214,9 +214,12 @@ StatementCache::StatementCache(sqlite3* db) : db_(db) {}
 StatementCache::~StatementCache() = default;
 
 Statement& StatementCache::statement(const std::string& sql) {
-  auto& slot = statements_[sql];
-  if (!slot) slot = std::make_unique<Statement>(db_, sql);
-  return slot->reset();
+  auto found = statements_.find(sql);
+  // Kept only once prepared: SQL that fails to prepare leaves no entry behind.
+  if (found == statements_.end()) {
+    found = statements_.emplace(sql, std::make_unique<Statement>(db_, sql)).first;
+  }
+  return found->second->reset();
 }
 
 void StatementCache::resetAll() {
