@@ -5,7 +5,8 @@
 
 #include <sqlite3.h>
 
-#include <cstdio>
+#include <algorithm>
+#include <charconv>
 #include <stdexcept>
 
 #include "simulator/CompanyFile.hpp"
@@ -184,19 +185,17 @@ void createTables(sqlite3* db) {
   }
 }
 
-std::string listIdText(int64_t id, int64_t created) {
+std::string txnIdText(int64_t id, int64_t created) {
+  // "%llX-%lld", written without the formatting machinery: a query writes one per record.
   char text[48];
-  std::snprintf(text, sizeof text, "%llX-%lld", static_cast<unsigned long long>(kListIdBase + id),
-                static_cast<long long>(created));
-  return text;
+  char* end = std::to_chars(text, text + 20, static_cast<unsigned long long>(id), 16).ptr;
+  std::transform(text, end, text, [](char c) { return c >= 'a' ? static_cast<char>(c - 32) : c; });
+  *end++ = '-';
+  end = std::to_chars(end, text + sizeof text, static_cast<long long>(created)).ptr;
+  return std::string(text, end);
 }
 
-std::string txnIdText(int64_t id, int64_t created) {
-  char text[48];
-  std::snprintf(text, sizeof text, "%llX-%lld", static_cast<unsigned long long>(id),
-                static_cast<long long>(created));
-  return text;
-}
+std::string listIdText(int64_t id, int64_t created) { return txnIdText(kListIdBase + id, created); }
 
 std::optional<std::pair<int64_t, int64_t>> parseListId(std::string_view text) {
   auto parsed = parseIdentifier(text);
