@@ -34,6 +34,10 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings);
 // session's); without them the document's statements are prepared for it alone.
 std::string answerRequests(CompanyFile& company, const RequestDocument& document,
                            handlers::StatementCache* kept = nullptr);
+// The same, writing the response document into `response` in place of what it held: a session
+// passes the same text each time, so that its room serves every response.
+void answerRequests(CompanyFile& company, const RequestDocument& document,
+                    handlers::StatementCache* kept, std::string& response);
 
 }  // namespace droqbxml::simulator
 

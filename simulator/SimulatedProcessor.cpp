@@ -236,7 +236,8 @@ Text SimulatedProcessor::BeginSession(const Text& qbFile, QBFileMode /*mode*/) {
 
   Text ticket = newTicket();
   auto statements = std::make_unique<handlers::StatementCache>(company->db());
-  sessions_.emplace(ticket, Session{std::move(path), std::move(company), std::move(statements)});
+  sessions_.emplace(ticket,
+                    Session{std::move(path), std::move(company), std::move(statements), {}});
   guard.keep();
   return ticket;
 }
@@ -250,7 +251,8 @@ Text SimulatedProcessor::ProcessRequest(const Text& ticket, const Text& request)
   // readable; anything else is its parse error.
   if (!read.document) raise(Failure::Parse);
   return onCompanyFile([&] {
-    return fromUtf8(answerRequests(*session.company, *read.document, session.statements.get()));
+    answerRequests(*session.company, *read.document, session.statements.get(), session.response);
+    return fromUtf8(session.response);
   });
 }
 

@@ -5,8 +5,18 @@
 
 namespace droqbxml::simulator::handlers {
 
-Context::Context(CompanyFile& company, Store& store, QbxmlVersion version)
-    : company(company), store(store), settings(company.settings()), version(version) {}
+Context::Context(CompanyFile& company, Store& store, QbxmlVersion version, std::string& response)
+    : company(company),
+      store(store),
+      settings(company.settings()),
+      version(version),
+      order(version),
+      response(response) {}
+
+void Context::add(Answer& answer, const Field& record) {
+  writeRecord(response, record, store);
+  ++answer.count;
+}
 
 std::optional<int64_t> Context::salesTaxCode(std::string_view name) {
   return store.findByFullName(ListTable::SalesTaxCodes, name);

@@ -1,7 +1,7 @@
 // What every request handler works with: the company file, its store, the company's settings,
-// the moment the request is answered and the qbXML version it was written for, plus the
-// company's standing entries (sales tax codes, the default sales tax item, special accounts)
-// looked up once per document.
+// the moment the request is answered and the qbXML version it was written for, the response
+// being written, plus the company's standing entries (sales tax codes, the default sales tax
+// item, special accounts) looked up once per document.
 #ifndef DROQBXML_SIMULATOR_HANDLERS_CONTEXT_HPP_
 #define DROQBXML_SIMULATOR_HANDLERS_CONTEXT_HPP_
 
@@ -19,13 +19,18 @@ namespace droqbxml::simulator::handlers {
 
 class Context {
  public:
-  Context(CompanyFile& company, Store& store, QbxmlVersion version);
+  Context(CompanyFile& company, Store& store, QbxmlVersion version, std::string& response);
 
   CompanyFile& company;
   Store& store;
   const CompanySettings settings;
   const QbxmlVersion version;
-  int64_t now = 0;  // set for each request
+  SchemaOrder order;      // for the records the document's answers write
+  std::string& response;  // the response document written so far
+  int64_t now = 0;        // set for each request
+
+  // Writes `record` into the response as one of `answer`'s records.
+  void add(Answer& answer, const Field& record);
 
   // The sales tax code of that name ("TAX", "NON"), if the company has it.
   std::optional<int64_t> salesTaxCode(std::string_view name);

@@ -144,6 +144,7 @@ class Reader {
         result.kind = Field::Kind::Aggregate;
         const uint64_t count = number();
         if (count > blob_.size()) damaged();
+        result.children.reserve(count);
         for (uint64_t i = 0; i < count; ++i) result.children.push_back(field(depth + 1));
         break;
       }

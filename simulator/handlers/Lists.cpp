@@ -185,9 +185,9 @@ class Balances {
 
 // The Ret aggregate of a list entry: the list core, what the entry keeps, and what QuickBooks
 // works out for it (balances, an account's type and cash-flow class).
-Field listRet(Context& context, const ListKind& kind, const ListRecord& record,
-              const Balances* balances) {
-  std::vector<Field> fields = record.fields;
+Field listRet(Context& context, const ListKind& kind, ListRecord record, const Balances* balances) {
+  std::vector<Field> fields = std::move(record.fields);
+  fields.reserve(fields.size() + 14);  // what follows adds at most this many
   std::string name = record.fullName;
   if (record.parent) {
     const std::string& parentName = context.store.identity(kind.table, *record.parent).fullName;
@@ -195,8 +195,11 @@ Field listRet(Context& context, const ListKind& kind, const ListRecord& record,
     fields.push_back(Field::reference("ParentRef", kind.table, *record.parent));
   }
   fields.push_back(Field::value("ListID", listIdText(record.id, record.created)));
-  fields.push_back(Field::value("TimeCreated", formatDateTime(record.created)));
-  fields.push_back(Field::value("TimeModified", formatDateTime(record.modified)));
+  std::string created = formatDateTime(record.created);
+  std::string modified =
+      record.modified == record.created ? created : formatDateTime(record.modified);
+  fields.push_back(Field::value("TimeCreated", std::move(created)));
+  fields.push_back(Field::value("TimeModified", std::move(modified)));
   fields.push_back(Field::value("EditSequence", std::to_string(record.modified)));
   fields.push_back(Field::value("Name", name));
   fields.push_back(Field::value("FullName", record.fullName));
@@ -218,7 +221,7 @@ Field listRet(Context& context, const ListKind& kind, const ListRecord& record,
       kind.table == ListTable::Items
           ? std::string(itemKindInfo(static_cast<ItemKind>(record.kind)).name) + "Ret"
           : retName(kind);
-  return Field::aggregate(ret, inSchemaOrder(ret, std::move(fields), context.version));
+  return Field::aggregate(ret, context.order.arrange(ret, std::move(fields)));
 }
 
 std::optional<Balances> balancesFor(Context& context, ListTable table) {
@@ -267,8 +270,8 @@ Answer addEntry(Context& context, const XmlNode& request, const ListKind& kind) 
   record.modified = context.now;
   context.store.insertList(kind.table, record);
   const Balances balances = Balances::ofNewEntry(record);
-  answer.records.push_back(
-      listRet(context, kind, record, kind.table == ListTable::Items ? nullptr : &balances));
+  context.add(answer, listRet(context, kind, std::move(record),
+                              kind.table == ListTable::Items ? nullptr : &balances));
   return answer;
 }
 
@@ -297,9 +300,9 @@ std::vector<ListRecord> namedEntries(Context& context, const XmlNode& request, L
   return records;
 }
 
-// The entries a query's filters select, in the list's order.
-std::vector<ListRecord> filteredEntries(Context& context, const XmlNode& request, ListTable table,
-                                        const std::vector<int>& kinds, const QueryFilter& filter) {
+// The statement selecting the entries a query's filters select, in the list's order.
+Statement& filteredEntries(Context& context, const XmlNode& request, ListTable table,
+                           const std::vector<int>& kinds, const QueryFilter& filter) {
   Conditions conditions;
   if (!kinds.empty()) {
     std::string in;
@@ -348,9 +351,7 @@ std::vector<ListRecord> filteredEntries(Context& context, const XmlNode& request
       (table == ListTable::Customers ? " ORDER BY " : " ORDER BY kind, ") +
       "replace(full_name, ':', char(1)) COLLATE NOCASE, id" + filter.limit());
   conditions.bind(rows);
-  std::vector<ListRecord> records;
-  while (rows.step()) records.push_back(Store::listRecord(rows));
-  return records;
+  return rows;
 }
 
 Answer queryEntries(Context& context, const XmlNode& request, const ListKind& kind,
@@ -359,17 +360,20 @@ Answer queryEntries(Context& context, const XmlNode& request, const ListKind& ki
   const QueryFilter filter = QueryFilter::read(request);
   std::optional<std::string> missing;
   const bool named = request.child("ListID") != nullptr || request.child("FullName") != nullptr;
-  std::vector<ListRecord> records =
-      named ? namedEntries(context, request, kind.table, kinds, missing)
-            : filteredEntries(context, request, kind.table, kinds, filter);
   const auto balances = balancesFor(context, kind.table);
-  std::vector<Field> rets;
-  rets.reserve(records.size());
-  for (const ListRecord& record : records) {
-    rets.push_back(
-        filter.included(listRet(context, kind, record, balances ? &*balances : nullptr)));
+  const auto add = [&](ListRecord record) {
+    context.add(answer, filter.included(listRet(context, kind, std::move(record),
+                                                balances ? &*balances : nullptr)));
+  };
+  if (named) {
+    for (ListRecord& record : namedEntries(context, request, kind.table, kinds, missing)) {
+      add(std::move(record));
+    }
+  } else {
+    Statement& rows = filteredEntries(context, request, kind.table, kinds, filter);
+    while (rows.step()) add(Store::listRecord(rows));
   }
-  finishQuery(answer, std::move(rets), missing);
+  finishQuery(answer, missing);
   return answer;
 }
 
@@ -435,7 +439,7 @@ Answer queryPayrollItemWages(Context&, const XmlNode& request) {
   for (const XmlNode& child : request.children) {
     if (!missing && (child.name == "ListID" || child.name == "FullName")) missing = child.text;
   }
-  finishQuery(answer, {}, missing);
+  finishQuery(answer, missing);
   return answer;
 }
 

@@ -300,13 +300,13 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
     const auto lineField = [&](const TxnLine& line, const std::string& ret) {
       std::vector<Field> lineFields = line.fields;
       lineFields.push_back(Field::value("TxnLineID", txnIdText(line.id, txn.created)));
-      return Field::aggregate(ret, inSchemaOrder(ret, std::move(lineFields), context.version));
+      return Field::aggregate(ret, context.order.arrange(ret, std::move(lineFields)));
     };
     std::optional<Field> group;
     const auto closeGroup = [&] {
       if (group)
         fields.push_back(Field::aggregate(
-            groupRet, inSchemaOrder(groupRet, std::move(group->children), context.version)));
+            groupRet, context.order.arrange(groupRet, std::move(group->children))));
       group.reset();
     };
     for (const TxnLine& line : txn.lines) {
@@ -325,7 +325,7 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
     closeGroup();
   }
   const std::string ret = named(kind, "Ret");
-  return Field::aggregate(ret, inSchemaOrder(ret, std::move(fields), context.version));
+  return Field::aggregate(ret, context.order.arrange(ret, std::move(fields)));
 }
 
 Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
@@ -415,7 +415,7 @@ Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
   txn.lines = std::move(lines.lines());
   context.store.insertTxn(kind.table, txn);
   if (kind.invoice) sellFromStock(context, txn.lines);
-  answer.records.push_back(txnRet(context, kind, txn, true));
+  context.add(answer, txnRet(context, kind, txn, true));
   return answer;
 }
 
@@ -514,7 +514,6 @@ Answer queryTxns(Context& context, const XmlNode& request, const TxnKind& kind) 
                      request.child("RefNumberCaseSensitive") != nullptr;
   const std::vector<int64_t> ids = named ? namedTxns(context, request, kind, missing)
                                          : filteredTxns(context, request, kind, filter);
-  std::vector<Field> rets;
   for (const int64_t id : ids) {
     Statement& row =
         context.store.statement("SELECT " + std::string(Store::kTxnColumns) + " FROM " +
@@ -523,9 +522,9 @@ Answer queryTxns(Context& context, const XmlNode& request, const TxnKind& kind) 
     if (!row.step()) continue;
     TxnRecord txn = Store::txnRecord(row);
     if (withLines) context.store.loadLines(kind.table, txn);
-    rets.push_back(filter.included(txnRet(context, kind, txn, withLines)));
+    context.add(answer, filter.included(txnRet(context, kind, txn, withLines)));
   }
-  finishQuery(answer, std::move(rets), missing);
+  finishQuery(answer, missing);
   return answer;
 }
 

@@ -9,6 +9,7 @@
 #include <map>
 #include <memory>
 #include <set>
+#include <string>
 #include <vector>
 
 #include "droqbxml/connection/RequestProcessor.hpp"
@@ -69,6 +70,7 @@ class SimulatedProcessor final : public RequestProcessor {
     std::unique_ptr<CompanyFile> company;
     // Prepared on the company file's connection for the session's requests; ends before it.
     std::unique_ptr<handlers::StatementCache> statements;
+    std::string response;  // the last response document, whose room the next one reuses
   };
 
   void requireConnection() const;

@@ -52,6 +52,11 @@ class AutomatonBuilder {
     for (std::uint16_t particle : automaton_.positions) {
       automaton_.missingAfter.push_back(requiredAfter(particle));
     }
+    automaton_.order = namesOf(allPositions());
+    for (std::size_t rank = 0; rank < automaton_.order.size(); ++rank) {
+      automaton_.ranks.emplace_back(automaton_.order[rank], static_cast<int>(rank));
+    }
+    std::sort(automaton_.ranks.begin(), automaton_.ranks.end());
   }
 
  private:
@@ -109,6 +114,12 @@ class AutomatonBuilder {
     if (particle.minOccurs == 0) result.nullable = true;
     fragmentAt(index) = result;
     return result;
+  }
+
+  std::vector<int> allPositions() const {
+    std::vector<int> positions(automaton_.positions.size());
+    for (std::size_t i = 0; i < positions.size(); ++i) positions[i] = static_cast<int>(i);
+    return positions;
   }
 
   std::vector<std::string_view> namesOf(const std::vector<int>& positions) const {
@@ -179,13 +190,11 @@ const Particle& ContentAutomaton::particleAt(int position) const {
   return kParticles[positions[static_cast<std::size_t>(position)]];
 }
 
-std::vector<std::string_view> ContentAutomaton::names() const {
-  std::vector<std::string_view> result;
-  for (std::uint16_t index : positions) {
-    const std::string_view name = kParticles[index].name;
-    if (std::find(result.begin(), result.end(), name) == result.end()) result.push_back(name);
-  }
-  return result;
+int ContentAutomaton::rankOf(std::string_view name) const {
+  const auto found = std::lower_bound(ranks.begin(), ranks.end(), name,
+                                      [](const std::pair<std::string_view, int>& entry,
+                                         std::string_view wanted) { return entry.first < wanted; });
+  return found != ranks.end() && found->first == name ? found->second : -1;
 }
 
 const ContentAutomaton& automatonOf(int index) {
@@ -206,7 +215,7 @@ namespace droqbxml::simulator {
 std::vector<std::string_view> schemaChildOrder(std::string_view aggregate) {
   const int index = internal::findAggregate(aggregate);
   if (index < 0) return {};
-  return internal::automatonOf(index).names();
+  return internal::automatonOf(index).order;
 }
 
 }  // namespace droqbxml::simulator
