@@ -114,7 +114,7 @@ struct ContentAutomaton {
   int rankOf(std::string_view name) const;
 };
 
-// The automaton of aggregate `index` (built once, on first use, for all aggregates).
+// The automaton of aggregate `index` (built once, when first asked for).
 const ContentAutomaton& automatonOf(int index);
 
 }  // namespace droqbxml::simulator::internal

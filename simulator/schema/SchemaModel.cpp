@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cstddef>
+#include <mutex>
 #include <string_view>
 #include <vector>
 
@@ -27,7 +28,12 @@ struct Fragment {
   std::vector<int> last;
 };
 
+// Adds the positions of `from` (which holds none twice) that `to` lacks, in their order.
 void addAll(std::vector<int>& to, const std::vector<int>& from) {
+  if (to.empty()) {  // the usual case, which a long repeated choice makes quadratic otherwise
+    to = from;
+    return;
+  }
   for (int position : from) {
     if (std::find(to.begin(), to.end(), position) == to.end()) to.push_back(position);
   }
@@ -198,14 +204,13 @@ int ContentAutomaton::rankOf(std::string_view name) const {
 }
 
 const ContentAutomaton& automatonOf(int index) {
-  static const std::vector<ContentAutomaton> automata = [] {
-    std::vector<ContentAutomaton> all(kAggregates.size());
-    for (std::size_t i = 0; i < kAggregates.size(); ++i) {
-      AutomatonBuilder(all[i], kAggregates[i].rootParticle).build();
-    }
-    return all;
-  }();
-  return automata[static_cast<std::size_t>(index)];
+  // Each built when first asked for: a document touches a handful of the aggregates.
+  static std::vector<ContentAutomaton> automata(kAggregates.size());
+  static std::vector<std::once_flag> built(kAggregates.size());
+  const auto at = static_cast<std::size_t>(index);
+  std::call_once(built[at],
+                 [&] { AutomatonBuilder(automata[at], kAggregates[at].rootParticle).build(); });
+  return automata[at];
 }
 
 }  // namespace droqbxml::simulator::internal
