@@ -129,7 +129,7 @@ void answerRequests(CompanyFile& company, const RequestDocument& document,
       handlers::finishAnswer(response, start, answer);
       refused = refusal.status().isError();
     }
-    store.resetStatements();
+    store.endRequest();
     if (refused && onError == "stopOnError") break;
   }
   response += handlers::kResponseEnd;

@@ -233,7 +233,10 @@ Store::~Store() { statements_.resetAll(); }
 
 Statement& Store::statement(const std::string& sql) { return statements_.statement(sql); }
 
-void Store::resetStatements() { statements_.resetAll(); }
+void Store::endRequest() {
+  statements_.resetAll();
+  entries_.clear();
+}
 
 std::string_view Store::tableName(ListTable table) {
   switch (table) {
@@ -273,11 +276,15 @@ ListRecord Store::listRecord(const Statement& row) {
 }
 
 std::optional<ListRecord> Store::list(ListTable table, int64_t id) {
+  const auto key = std::make_pair(table, id);
+  const auto found = entries_.find(key);
+  if (found != entries_.end()) return found->second;
   Statement& row = statement("SELECT " + std::string(kListColumns) + " FROM " +
                              std::string(tableName(table)) + " WHERE id = ?");
   row.bind(1, id);
-  if (!row.step()) return std::nullopt;
-  return listRecord(row);
+  std::optional<ListRecord> record;
+  if (row.step()) record = listRecord(row);
+  return entries_.emplace(key, std::move(record)).first->second;
 }
 
 int64_t Store::insertList(ListTable table, ListRecord& record) {
@@ -296,6 +303,7 @@ int64_t Store::insertList(ListTable table, ListRecord& record) {
       .bindBlob(9, encodeFields(record.fields));
   insert.step();
   record.id = sqlite3_last_insert_rowid(db());
+  entries_.erase(std::make_pair(table, record.id));
   return record.id;
 }
 
@@ -304,6 +312,7 @@ void Store::updateFields(ListTable table, int64_t id, const std::vector<Field>& 
       statement("UPDATE " + std::string(tableName(table)) + " SET fields = ? WHERE id = ?");
   update.bindBlob(1, encodeFields(fields)).bind(2, id);
   update.step();
+  entries_.erase(std::make_pair(table, id));
 }
 
 std::optional<int64_t> Store::findByListId(ListTable table, std::string_view listId) {
@@ -336,7 +345,10 @@ const ListIdentity& Store::identity(ListTable table, int64_t id) {
       .first->second;
 }
 
-void Store::forgetLookups() { identities_.clear(); }
+void Store::forgetLookups() {
+  identities_.clear();
+  entries_.clear();
+}
 
 TxnRecord Store::txnRecord(const Statement& row) {
   TxnRecord record;

@@ -144,8 +144,9 @@ class Store {
   sqlite3* db() const noexcept { return statements_.db(); }
   // The statement for `sql`, prepared on first use and reset for this one.
   Statement& statement(const std::string& sql);
-  // Rewinds every statement, so that none holds the file between requests.
-  void resetStatements();
+  // After a request: rewinds every statement, so that none holds the file, and forgets the
+  // entries read (another process may change them before the next request).
+  void endRequest();
 
   static std::string_view tableName(ListTable table);
   static std::string_view tableName(TxnTable table);
@@ -158,6 +159,7 @@ class Store {
   // The record of the current row of a statement that selected kListColumns first.
   static ListRecord listRecord(const Statement& row);
 
+  // The entry, read from the file once per request (until the request changes it).
   std::optional<ListRecord> list(ListTable table, int64_t id);
   // Adds the entry under the next ListID number, which it sets in `record` and returns.
   int64_t insertList(ListTable table, ListRecord& record);
@@ -183,6 +185,7 @@ class Store {
   std::unique_ptr<StatementCache> own_;
   StatementCache& statements_;
   std::map<std::pair<ListTable, int64_t>, ListIdentity> identities_;
+  std::map<std::pair<ListTable, int64_t>, std::optional<ListRecord>> entries_;  // this request's
 };
 
 }  // namespace droqbxml::simulator::handlers
