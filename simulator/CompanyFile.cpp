@@ -201,6 +201,37 @@ bool hasTable(sqlite3* db, std::string_view table) {
   return found.step();
 }
 
+// Rewinds a kept statement when it goes out of scope, however its use ends.
+using Rewind = std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)>;
+
+// The statement kept in `slot` for `sql`, prepared on first use.
+sqlite3_stmt* kept(sqlite3* db, sqlite3_stmt*& slot, std::string_view sql) {
+  if (slot == nullptr) {
+    const int prepared = sqlite3_prepare_v3(db, sql.data(), static_cast<int>(sql.size()),
+                                            SQLITE_PREPARE_PERSISTENT, &slot, nullptr);
+    if (prepared != SQLITE_OK) failSqlite(db, prepared, sql);
+  }
+  return slot;
+}
+
+// Runs `sql`, a statement without rows, through the statement kept in `slot`.
+void runKept(sqlite3* db, sqlite3_stmt*& slot, std::string_view sql) {
+  const Rewind rewind(kept(db, slot, sql), sqlite3_reset);
+  const int result = sqlite3_step(slot);
+  if (result != SQLITE_DONE) failSqlite(db, result, sql);
+}
+
+CompanySettings readSettings(sqlite3* db) {
+  CompanySettings settings;
+  Statement rows(db, "SELECT key, value FROM settings");
+  while (rows.step()) {
+    const std::string key = rows.text(0);
+    if (key == kCompanyNameKey) settings.companyName = rows.text(1);
+    if (key == kSalesTaxKey) settings.salesTax = rows.text(1) == "1";
+  }
+  return settings;
+}
+
 }  // namespace
 
 void CompanyFile::create(const std::filesystem::path& path, const CompanySettings& settings) {
@@ -285,32 +316,30 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
   if (!folderWritable(path)) fail(Kind::ReadOnly, path, "its folder cannot be written");
 
   configure(db.get());
+  settings_ = readSettings(db.get());
   db_ = db.release();
 }
 
 CompanyFile::~CompanyFile() {
-  sqlite3_finalize(counter_);
+  for (sqlite3_stmt* statement : {counter_, begin_, commit_}) sqlite3_finalize(statement);
   sqlite3_close_v2(db_);
-}
-
-CompanySettings CompanyFile::settings() const {
-  CompanySettings settings;
-  Statement rows(db_, "SELECT key, value FROM settings");
-  while (rows.step()) {
-    const std::string key = rows.text(0);
-    if (key == kCompanyNameKey) settings.companyName = rows.text(1);
-    if (key == kSalesTaxKey) settings.salesTax = rows.text(1) == "1";
-  }
-  return settings;
 }
 
 void CompanyFile::inTransaction(const std::function<void()>& work) {
   // Inside a transaction already: a savepoint, so that the inner work alone is undone.
   const bool nested = sqlite3_get_autocommit(db_) == 0;
-  execute(db_, nested ? "SAVEPOINT inner_work" : "BEGIN IMMEDIATE");
+  if (nested) {
+    execute(db_, "SAVEPOINT inner_work");
+  } else {
+    runKept(db_, begin_, "BEGIN IMMEDIATE");
+  }
   try {
     work();
-    execute(db_, nested ? "RELEASE inner_work" : "COMMIT");
+    if (nested) {
+      execute(db_, "RELEASE inner_work");
+    } else {
+      runKept(db_, commit_, "COMMIT");
+    }
   } catch (...) {
     // SQLite may have rolled back on its own (a full disk, an I/O error).
     if (sqlite3_get_autocommit(db_) == 0) {
@@ -325,13 +354,8 @@ int64_t CompanyFile::nextCounter(std::string_view counter, int64_t count) {
   static constexpr std::string_view kNext =
       "INSERT INTO counters (name, value) VALUES (?1, ?2) "
       "ON CONFLICT (name) DO UPDATE SET value = value + ?2 RETURNING value - ?2 + 1";
-  if (counter_ == nullptr) {
-    const int prepared = sqlite3_prepare_v3(db_, kNext.data(), static_cast<int>(kNext.size()),
-                                            SQLITE_PREPARE_PERSISTENT, &counter_, nullptr);
-    if (prepared != SQLITE_OK) failSqlite(db_, prepared, kNext);
-  }
   // Rewound however it ends, so that the statement holds nothing between calls.
-  const std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)> rewind(counter_, sqlite3_reset);
+  const Rewind rewind(kept(db_, counter_, kNext), sqlite3_reset);
   sqlite3_bind_text(counter_, 1, counter.data(), static_cast<int>(counter.size()),
                     SQLITE_TRANSIENT);
   sqlite3_bind_int64(counter_, 2, count);

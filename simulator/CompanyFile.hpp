@@ -64,7 +64,9 @@ class CompanyFile {
 
   const std::filesystem::path& path() const noexcept { return path_; }
   sqlite3* db() const noexcept { return db_; }
-  CompanySettings settings() const;
+  // The company's name and sales tax setting, as the file was created with them (read when it
+  // was opened: nothing changes them).
+  const CompanySettings& settings() const noexcept { return settings_; }
 
   // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting up to 10 s
   // for another process's transaction to end); rolls back and rethrows when `work` throws.
@@ -90,7 +92,11 @@ class CompanyFile {
  private:
   std::filesystem::path path_;
   sqlite3* db_ = nullptr;
-  sqlite3_stmt* counter_ = nullptr;  // nextCounter's, prepared on first use and kept
+  CompanySettings settings_;
+  // Statements prepared on first use and kept: nextCounter's and the transaction's.
+  sqlite3_stmt* counter_ = nullptr;
+  sqlite3_stmt* begin_ = nullptr;
+  sqlite3_stmt* commit_ = nullptr;
 };
 
 }  // namespace droqbxml::simulator
