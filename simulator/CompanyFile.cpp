@@ -204,21 +204,20 @@ bool hasTable(sqlite3* db, std::string_view table) {
 // Rewinds a kept statement when it goes out of scope, however its use ends.
 using Rewind = std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)>;
 
-// The statement kept in `slot` for `sql`, prepared on first use.
-sqlite3_stmt* kept(sqlite3* db, sqlite3_stmt*& slot, std::string_view sql) {
-  if (slot == nullptr) {
-    const int prepared = sqlite3_prepare_v3(db, sql.data(), static_cast<int>(sql.size()),
-                                            SQLITE_PREPARE_PERSISTENT, &slot, nullptr);
-    if (prepared != SQLITE_OK) failSqlite(db, prepared, sql);
-  }
-  return slot;
-}
+// The statements a company file keeps prepared (CompanyFile::kept_), by their place.
+enum Kept : size_t { kBegin, kCommit, kCountOn, kCountFrom, kCounterValue };
+constexpr std::array<std::string_view, 5> kKeptSql{{
+    "BEGIN IMMEDIATE",
+    "COMMIT",
+    "UPDATE counters SET value = value + ?2 WHERE name = ?1",
+    "INSERT INTO counters (name, value) VALUES (?1, ?2)",
+    "SELECT value FROM counters WHERE name = ?1",
+}};
 
-// Runs `sql`, a statement without rows, through the statement kept in `slot`.
-void runKept(sqlite3* db, sqlite3_stmt*& slot, std::string_view sql) {
-  const Rewind rewind(kept(db, slot, sql), sqlite3_reset);
-  const int result = sqlite3_step(slot);
-  if (result != SQLITE_DONE) failSqlite(db, result, sql);
+// Runs a statement without rows to its end.
+void run(sqlite3* db, sqlite3_stmt* statement) {
+  const int result = sqlite3_step(statement);
+  if (result != SQLITE_DONE) failSqlite(db, result, sqlite3_sql(statement));
 }
 
 CompanySettings readSettings(sqlite3* db) {
@@ -321,8 +320,20 @@ CompanyFile::CompanyFile(const std::filesystem::path& path) : path_(path) {
 }
 
 CompanyFile::~CompanyFile() {
-  for (sqlite3_stmt* statement : {counter_, begin_, commit_}) sqlite3_finalize(statement);
+  for (sqlite3_stmt* statement : kept_) sqlite3_finalize(statement);
   sqlite3_close_v2(db_);
+}
+
+sqlite3_stmt* CompanyFile::kept(size_t which) {
+  static_assert(std::tuple_size_v<decltype(kept_)> == kKeptSql.size());
+  sqlite3_stmt*& slot = kept_[which];
+  if (slot == nullptr) {
+    const std::string_view sql = kKeptSql[which];
+    const int prepared = sqlite3_prepare_v3(db_, sql.data(), static_cast<int>(sql.size()),
+                                            SQLITE_PREPARE_PERSISTENT, &slot, nullptr);
+    if (prepared != SQLITE_OK) failSqlite(db_, prepared, sql);
+  }
+  return slot;
 }
 
 void CompanyFile::inTransaction(const std::function<void()>& work) {
@@ -331,14 +342,14 @@ void CompanyFile::inTransaction(const std::function<void()>& work) {
   if (nested) {
     execute(db_, "SAVEPOINT inner_work");
   } else {
-    runKept(db_, begin_, "BEGIN IMMEDIATE");
+    run(db_, Rewind(kept(kBegin), sqlite3_reset).get());
   }
   try {
     work();
     if (nested) {
       execute(db_, "RELEASE inner_work");
     } else {
-      runKept(db_, commit_, "COMMIT");
+      run(db_, Rewind(kept(kCommit), sqlite3_reset).get());
     }
   } catch (...) {
     // SQLite may have rolled back on its own (a full disk, an I/O error).
@@ -351,21 +362,24 @@ void CompanyFile::inTransaction(const std::function<void()>& work) {
 }
 
 int64_t CompanyFile::nextCounter(std::string_view counter, int64_t count) {
-  static constexpr std::string_view kNext =
-      "INSERT INTO counters (name, value) VALUES (?1, ?2) "
-      "ON CONFLICT (name) DO UPDATE SET value = value + ?2 RETURNING value - ?2 + 1";
-  // Rewound however it ends, so that the statement holds nothing between calls.
-  const Rewind rewind(kept(db_, counter_, kNext), sqlite3_reset);
-  sqlite3_bind_text(counter_, 1, counter.data(), static_cast<int>(counter.size()),
-                    SQLITE_TRANSIENT);
-  sqlite3_bind_int64(counter_, 2, count);
-  int result = sqlite3_step(counter_);
+  // Each statement rewound however its use ends, so that none holds anything between calls.
+  const auto bound = [&](Kept which) {
+    Rewind statement(kept(which), sqlite3_reset);
+    sqlite3_bind_text(statement.get(), 1, counter.data(), static_cast<int>(counter.size()),
+                      SQLITE_TRANSIENT);
+    if (sqlite3_bind_parameter_count(statement.get()) > 1) {
+      sqlite3_bind_int64(statement.get(), 2, count);
+    }
+    return statement;
+  };
+  // Counted on, or started when the file has no such counter yet.
+  run(db_, bound(kCountOn).get());
+  if (sqlite3_changes(db_) == 0) run(db_, bound(kCountFrom).get());
+  const Rewind value = bound(kCounterValue);
+  const int result = sqlite3_step(value.get());
   if (result == SQLITE_DONE) failSqlite(db_, SQLITE_ERROR, "nextCounter");
-  if (result != SQLITE_ROW) failSqlite(db_, result, kNext);
-  const int64_t value = sqlite3_column_int64(counter_, 0);
-  result = sqlite3_step(counter_);
-  if (result != SQLITE_DONE) failSqlite(db_, result, kNext);
-  return value;
+  if (result != SQLITE_ROW) failSqlite(db_, result, kKeptSql[kCounterValue]);
+  return sqlite3_column_int64(value.get(), 0) - count + 1;
 }
 
 std::optional<ApplicationAccess> CompanyFile::application(std::string_view appName) const {

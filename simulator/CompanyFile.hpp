@@ -5,6 +5,7 @@
 #ifndef DROQBXML_SIMULATOR_COMPANYFILE_HPP_
 #define DROQBXML_SIMULATOR_COMPANYFILE_HPP_
 
+#include <array>
 #include <cstdint>
 #include <filesystem>
 #include <functional>
@@ -90,13 +91,13 @@ class CompanyFile {
   std::string summary() const;
 
  private:
+  // The statement kept in kept_[which], prepared when first used.
+  sqlite3_stmt* kept(size_t which);
+
   std::filesystem::path path_;
   sqlite3* db_ = nullptr;
   CompanySettings settings_;
-  // Statements prepared on first use and kept: nextCounter's and the transaction's.
-  sqlite3_stmt* counter_ = nullptr;
-  sqlite3_stmt* begin_ = nullptr;
-  sqlite3_stmt* commit_ = nullptr;
+  std::array<sqlite3_stmt*, 5> kept_{};  // a transaction's and nextCounter's statements
 };
 
 }  // namespace droqbxml::simulator
