@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cstdint>
+#include <cstring>
 #include <tuple>
 
 #include "simulator/internal/SchemaModel.hpp"
@@ -61,10 +62,29 @@ constexpr std::array<uint8_t, 256> kEscapes = [] {
   return escapes;
 }();
 
+// Whether any of the eight characters in `word` may need escaping: a zero byte in `word` xor
+// a character repeated eight times is that character.
+bool mayEscape(uint64_t word) {
+  constexpr uint64_t kOnes = 0x0101010101010101;
+  constexpr uint64_t kHighs = 0x8080808080808080;
+  uint64_t found = 0;
+  for (const uint64_t special : {kOnes * '&', kOnes * '<', kOnes * '"'}) {
+    const uint64_t x = word ^ special;
+    found |= (x - kOnes) & ~x & kHighs;
+  }
+  return found != 0;
+}
+
 void appendEscaped(std::string& out, std::string_view text, bool attribute) {
+  // Values mostly need no escaping: look at eight characters at a time up to the first that may.
+  size_t at = 0;
+  for (uint64_t word = 0; at + 8 <= text.size(); at += 8) {
+    std::memcpy(&word, text.data() + at, 8);
+    if (mayEscape(word)) break;
+  }
   const uint8_t last = attribute ? 3 : 2;
   size_t run = 0;  // the start of the characters not yet written
-  for (size_t at = 0; at < text.size(); ++at) {
+  for (; at < text.size(); ++at) {
     const uint8_t escape = kEscapes[static_cast<unsigned char>(text[at])];
     if (escape == 0 || escape > last) continue;
     out.append(text, run, at - run);

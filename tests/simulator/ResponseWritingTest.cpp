@@ -54,6 +54,38 @@ TEST(ResponseWritingTest, TimesAndIdentifiersAsPrintfWritesThem) {
   }
 }
 
+TEST(ResponseWritingTest, TextEscapedAsOneCharacterAtATime) {
+  // Texts of every length from 1 to 40 from characters that need escaping, characters next to them
+  // and UTF-8 bytes, in an element and in the status message attribute.
+  std::mt19937 random(3);
+  const std::string alphabet = "&<\">'%;a7 \n\x7F\x80\xC3\xA9";
+  const auto escaped = [](const std::string& text, bool attribute) {
+    std::string out;
+    for (const char c : text) {
+      out += c == '&'                ? "&amp;"
+             : c == '<'              ? "&lt;"
+             : c == '"' && attribute ? "&quot;"
+                                     : std::string(1, c);
+    }
+    return out;
+  };
+  Store noFile(nullptr);  // values need no store
+  for (int round = 0; round < 4000; ++round) {
+    std::string text;
+    for (size_t size = 1 + random() % 40; text.size() < size;)
+      text += alphabet[random() % (round % 3 ? 4 : alphabet.size())];
+    std::string out;
+    writeRecord(out, Field::value("Memo", text), noFile);
+    ASSERT_EQ(out, "<Memo>" + escaped(text, false) + "</Memo>\n") << text;
+    Answer answer{"CustomerAddRs", std::nullopt, Status{}, 0};
+    answer.status.message = text;
+    out.clear();
+    finishAnswer(out, 0, answer);
+    ASSERT_NE(out.find("statusMessage=\"" + escaped(text, true) + "\" />"), std::string::npos)
+        << text;
+  }
+}
+
 TEST(ResponseWritingTest, ChildrenInTheOrderTheSchemaListsThem) {
   // Every aggregate's ranks against each name's place in its order.
   const auto aggregates = internal::aggregates();
