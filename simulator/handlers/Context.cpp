@@ -2,6 +2,7 @@
 #include "simulator/handlers/Context.hpp"
 
 #include "simulator/handlers/Catalog.hpp"
+#include "simulator/handlers/Clock.hpp"
 
 namespace droqbxml::simulator::handlers {
 
@@ -16,6 +17,13 @@ Context::Context(CompanyFile& company, Store& store, QbxmlVersion version, std::
 void Context::add(Answer& answer, const Field& record) {
   writeRecord(response, record, store);
   ++answer.count;
+}
+
+const std::string& Context::dateTimeText(int64_t time) {
+  if (!lastDateTime_ || lastDateTime_->first != time) {
+    lastDateTime_.emplace(time, formatDateTime(time));
+  }
+  return lastDateTime_->second;
 }
 
 std::optional<int64_t> Context::salesTaxCode(std::string_view name) {

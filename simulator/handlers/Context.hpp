@@ -10,6 +10,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 #include "simulator/CompanyFile.hpp"
 #include "simulator/handlers/Response.hpp"
@@ -31,6 +32,9 @@ class Context {
 
   // Writes `record` into the response as one of `answer`'s records.
   void add(Answer& answer, const Field& record);
+  // formatDateTime(time), remembered for the last time asked: the entries of a list come in
+  // runs made in the same second.
+  const std::string& dateTimeText(int64_t time);
 
   // The sales tax code of that name ("TAX", "NON"), if the company has it.
   std::optional<int64_t> salesTaxCode(std::string_view name);
@@ -44,6 +48,7 @@ class Context {
   void forgetLookups();
 
  private:
+  std::optional<std::pair<int64_t, std::string>> lastDateTime_;
   std::map<std::string, std::optional<int64_t>> specialAccounts_;
   std::map<int64_t, bool> taxable_;
 };

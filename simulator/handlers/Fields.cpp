@@ -225,9 +225,10 @@ std::string encodeFields(const std::vector<Field>& fields) {
   return out;
 }
 
-std::vector<Field> decodeFields(std::string_view blob) {
+std::vector<Field> decodeFields(std::string_view blob, size_t room) {
   Reader reader(blob);
   std::vector<Field> fields;
+  fields.reserve(16 + room);
   while (!reader.done()) fields.push_back(reader.field(0));
   return fields;
 }

@@ -43,8 +43,9 @@ void removeField(std::vector<Field>& fields, std::string_view name);
 // The compact form a company file keeps: element names as numbers of a fixed, append-only
 // table (unknown names inline), lengths and rows as variable-length integers.
 std::string encodeFields(const std::vector<Field>& fields);
-// The inverse of encodeFields; a blob that is not one raises std::runtime_error.
-std::vector<Field> decodeFields(std::string_view blob);
+// The inverse of encodeFields; a blob that is not one raises std::runtime_error. `room`: how
+// many fields the caller is about to add.
+std::vector<Field> decodeFields(std::string_view blob, size_t room = 0);
 
 }  // namespace droqbxml::simulator::handlers
 

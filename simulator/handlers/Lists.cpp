@@ -187,7 +187,7 @@ class Balances {
 // works out for it (balances, an account's type and cash-flow class).
 Field listRet(Context& context, const ListKind& kind, ListRecord record, const Balances* balances) {
   std::vector<Field> fields = std::move(record.fields);
-  fields.reserve(fields.size() + 14);  // what follows adds at most this many
+  fields.reserve(fields.size() + Store::kRetRoom);  // what follows adds at most this many
   std::string name = record.fullName;
   if (record.parent) {
     const std::string& parentName = context.store.identity(kind.table, *record.parent).fullName;
@@ -195,11 +195,8 @@ Field listRet(Context& context, const ListKind& kind, ListRecord record, const B
     fields.push_back(Field::reference("ParentRef", kind.table, *record.parent));
   }
   fields.push_back(Field::value("ListID", listIdText(record.id, record.created)));
-  std::string created = formatDateTime(record.created);
-  std::string modified =
-      record.modified == record.created ? created : formatDateTime(record.modified);
-  fields.push_back(Field::value("TimeCreated", std::move(created)));
-  fields.push_back(Field::value("TimeModified", std::move(modified)));
+  fields.push_back(Field::value("TimeCreated", context.dateTimeText(record.created)));
+  fields.push_back(Field::value("TimeModified", context.dateTimeText(record.modified)));
   fields.push_back(Field::value("EditSequence", std::to_string(record.modified)));
   fields.push_back(Field::value("Name", name));
   fields.push_back(Field::value("FullName", record.fullName));

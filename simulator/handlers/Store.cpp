@@ -271,7 +271,7 @@ ListRecord Store::listRecord(const Statement& row) {
   record.created = row.integer(6);
   record.modified = row.integer(7);
   record.openingBalance = row.integer(8) * kCent;
-  record.fields = decodeFields(row.blob(9));
+  record.fields = decodeFields(row.blob(9), kRetRoom);
   return record;
 }
 

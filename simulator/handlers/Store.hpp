@@ -156,8 +156,10 @@ class Store {
   static constexpr std::string_view kListColumns =
       "id, kind, full_name, parent, sublevel, is_active, created, modified, opening_balance, "
       "fields";
-  // The record of the current row of a statement that selected kListColumns first.
+  // The record of the current row of a statement that selected kListColumns first, its fields
+  // with room for the kRetRoom that a Ret aggregate adds to them.
   static ListRecord listRecord(const Statement& row);
+  static constexpr size_t kRetRoom = 14;
 
   // The entry, read from the file once per request (until the request changes it).
   std::optional<ListRecord> list(ListTable table, int64_t id);

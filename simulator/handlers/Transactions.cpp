@@ -272,8 +272,8 @@ void defaultField(std::vector<Field>& fields, Field field) {
 Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool withLines) {
   std::vector<Field> fields = txn.fields;
   fields.push_back(Field::value("TxnID", txnIdText(txn.id, txn.created)));
-  fields.push_back(Field::value("TimeCreated", formatDateTime(txn.created)));
-  fields.push_back(Field::value("TimeModified", formatDateTime(txn.modified)));
+  fields.push_back(Field::value("TimeCreated", context.dateTimeText(txn.created)));
+  fields.push_back(Field::value("TimeModified", context.dateTimeText(txn.modified)));
   fields.push_back(Field::value("EditSequence", std::to_string(txn.modified)));
   fields.push_back(Field::value("TxnNumber", std::to_string(txn.number)));
   fields.push_back(Field::reference("CustomerRef", ListTable::Customers, txn.customer));
