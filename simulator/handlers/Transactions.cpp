@@ -269,8 +269,8 @@ void defaultField(std::vector<Field>& fields, Field field) {
 }
 
 // The Ret aggregate of a transaction, with its lines when `withLines`.
-Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool withLines) {
-  std::vector<Field> fields = txn.fields;
+Field txnRet(Context& context, const TxnKind& kind, TxnRecord txn, bool withLines) {
+  std::vector<Field> fields = std::move(txn.fields);
   fields.push_back(Field::value("TxnID", txnIdText(txn.id, txn.created)));
   fields.push_back(Field::value("TimeCreated", context.dateTimeText(txn.created)));
   fields.push_back(Field::value("TimeModified", context.dateTimeText(txn.modified)));
@@ -297,8 +297,8 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
   if (withLines) {
     const std::string lineRet = named(kind, "LineRet");
     const std::string groupRet = named(kind, "LineGroupRet");
-    const auto lineField = [&](const TxnLine& line, const std::string& ret) {
-      std::vector<Field> lineFields = line.fields;
+    const auto lineField = [&](TxnLine& line, const std::string& ret) {
+      std::vector<Field> lineFields = std::move(line.fields);
       lineFields.push_back(Field::value("TxnLineID", txnIdText(line.id, txn.created)));
       return Field::aggregate(ret, context.order.arrange(ret, std::move(lineFields)));
     };
@@ -309,14 +309,14 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
             groupRet, context.order.arrange(groupRet, std::move(group->children))));
       group.reset();
     };
-    for (const TxnLine& line : txn.lines) {
+    for (TxnLine& line : txn.lines) {
       if (line.kind == LineKind::GroupMember && group) {
         group->children.push_back(lineField(line, lineRet));
         continue;
       }
       closeGroup();
       if (line.kind == LineKind::Group) {
-        group = Field::aggregate(groupRet, line.fields);
+        group = Field::aggregate(groupRet, std::move(line.fields));
         group->children.push_back(Field::value("TxnLineID", txnIdText(line.id, txn.created)));
       } else {
         fields.push_back(lineField(line, lineRet));
@@ -415,7 +415,7 @@ Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
   txn.lines = std::move(lines.lines());
   context.store.insertTxn(kind.table, txn);
   if (kind.invoice) sellFromStock(context, txn.lines);
-  context.add(answer, txnRet(context, kind, txn, true));
+  context.add(answer, txnRet(context, kind, std::move(txn), true));
   return answer;
 }
 
@@ -522,7 +522,7 @@ Answer queryTxns(Context& context, const XmlNode& request, const TxnKind& kind) 
     if (!row.step()) continue;
     TxnRecord txn = Store::txnRecord(row);
     if (withLines) context.store.loadLines(kind.table, txn);
-    context.add(answer, filter.included(txnRet(context, kind, txn, withLines)));
+    context.add(answer, filter.included(txnRet(context, kind, std::move(txn), withLines)));
   }
   finishQuery(answer, missing);
   return answer;
