@@ -36,6 +36,9 @@ struct Field {
 const Field* findField(const std::vector<Field>& fields, std::string_view name);
 // The text of the first value field of that name, or the empty text.
 std::string fieldText(const std::vector<Field>& fields, std::string_view name);
+// Appends the value field `name` holding `text`, made where it is kept (records of a long list
+// are built field by field).
+void appendValue(std::vector<Field>& fields, std::string_view name, std::string text);
 // Replaces every field of that name by `field`, or appends it when there is none.
 void setField(std::vector<Field>& fields, Field field);
 void removeField(std::vector<Field>& fields, std::string_view name);

@@ -194,25 +194,23 @@ Field listRet(Context& context, const ListKind& kind, ListRecord record, const B
     name = record.fullName.substr(std::min(record.fullName.size(), parentName.size() + 1));
     fields.push_back(Field::reference("ParentRef", kind.table, *record.parent));
   }
-  fields.push_back(Field::value("ListID", listIdText(record.id, record.created)));
-  fields.push_back(Field::value("TimeCreated", context.dateTimeText(record.created)));
-  fields.push_back(Field::value("TimeModified", context.dateTimeText(record.modified)));
-  fields.push_back(Field::value("EditSequence", std::to_string(record.modified)));
-  fields.push_back(Field::value("Name", name));
-  fields.push_back(Field::value("FullName", record.fullName));
-  fields.push_back(Field::value("IsActive", record.active ? "true" : "false"));
-  fields.push_back(Field::value("Sublevel", std::to_string(record.sublevel)));
+  appendValue(fields, "ListID", listIdText(record.id, record.created));
+  appendValue(fields, "TimeCreated", context.dateTimeText(record.created));
+  appendValue(fields, "TimeModified", context.dateTimeText(record.modified));
+  appendValue(fields, "EditSequence", std::to_string(record.modified));
+  appendValue(fields, "Name", std::move(name));
+  appendValue(fields, "FullName", std::move(record.fullName));
+  appendValue(fields, "IsActive", record.active ? "true" : "false");
+  appendValue(fields, "Sublevel", std::to_string(record.sublevel));
   if (balances != nullptr) {
-    fields.push_back(
-        Field::value("Balance", formatNumber(balances->own(record.id), NumberKind::Amount)));
-    fields.push_back(
-        Field::value("TotalBalance", formatNumber(balances->total(record.id), NumberKind::Amount)));
+    appendValue(fields, "Balance", formatNumber(balances->own(record.id), NumberKind::Amount));
+    appendValue(fields, "TotalBalance",
+                formatNumber(balances->total(record.id), NumberKind::Amount));
   }
   if (kind.table == ListTable::Accounts) {
     const std::string_view type = accountTypeOfRank(record.kind);
-    fields.push_back(Field::value("AccountType", std::string(type)));
-    fields.push_back(
-        Field::value("CashFlowClassification", std::string(cashFlowClassification(type))));
+    appendValue(fields, "AccountType", std::string(type));
+    appendValue(fields, "CashFlowClassification", std::string(cashFlowClassification(type)));
   }
   const std::string ret =
       kind.table == ListTable::Items
