@@ -1,5 +1,9 @@
-// The company's standing entries, looked up when first needed.
+// Records written into the response, and the company's standing entries, looked up when first
+// needed.
 #include "simulator/handlers/Context.hpp"
+
+#include <algorithm>
+#include <iterator>
 
 #include "simulator/handlers/Catalog.hpp"
 #include "simulator/handlers/Clock.hpp"
@@ -16,6 +20,21 @@ Context::Context(CompanyFile& company, Store& store, QbxmlVersion version, std::
 
 void Context::add(Answer& answer, const Field& record) {
   writeRecord(response, record, store);
+  ++answer.count;
+}
+
+void Context::add(Answer& answer, std::string_view aggregate, const std::vector<Field>& fields,
+                  const std::vector<std::string>& included) {
+  const std::vector<size_t>& places = order.places(aggregate, fields);
+  if (included.empty()) {
+    writeRecord(response, aggregate, fields, places, store);
+  } else {
+    std::vector<size_t> kept;
+    std::copy_if(places.begin(), places.end(), std::back_inserter(kept), [&](size_t at) {
+      return std::find(included.begin(), included.end(), fields[at].name) != included.end();
+    });
+    writeRecord(response, aggregate, fields, kept, store);
+  }
   ++answer.count;
 }
 

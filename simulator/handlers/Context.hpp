@@ -32,6 +32,10 @@ class Context {
 
   // Writes `record` into the response as one of `answer`'s records.
   void add(Answer& answer, const Field& record);
+  // The same for the record `aggregate` holding `fields` in its schema order (SchemaOrder), only
+  // the fields named in `included` when it names any.
+  void add(Answer& answer, std::string_view aggregate, const std::vector<Field>& fields,
+           const std::vector<std::string>& included = {});
   // formatDateTime(time), remembered for the last time asked: the entries of a list come in
   // runs made in the same second.
   const std::string& dateTimeText(int64_t time);

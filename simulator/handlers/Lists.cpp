@@ -183,9 +183,15 @@ class Balances {
   std::map<int64_t, int64_t> total_;
 };
 
+// A Ret aggregate: its name and its fields, not yet in schema order.
+struct Ret {
+  std::string name;
+  std::vector<Field> fields;
+};
+
 // The Ret aggregate of a list entry: the list core, what the entry keeps, and what QuickBooks
 // works out for it (balances, an account's type and cash-flow class).
-Field listRet(Context& context, const ListKind& kind, ListRecord record, const Balances* balances) {
+Ret listRet(Context& context, const ListKind& kind, ListRecord record, const Balances* balances) {
   std::vector<Field> fields = std::move(record.fields);
   fields.reserve(fields.size() + Store::kRetRoom);  // what follows adds at most this many
   std::string name = record.fullName;
@@ -212,11 +218,10 @@ Field listRet(Context& context, const ListKind& kind, ListRecord record, const B
     appendValue(fields, "AccountType", std::string(type));
     appendValue(fields, "CashFlowClassification", std::string(cashFlowClassification(type)));
   }
-  const std::string ret =
-      kind.table == ListTable::Items
-          ? std::string(itemKindInfo(static_cast<ItemKind>(record.kind)).name) + "Ret"
-          : retName(kind);
-  return Field::aggregate(ret, context.order.arrange(ret, std::move(fields)));
+  return Ret{kind.table == ListTable::Items
+                 ? std::string(itemKindInfo(static_cast<ItemKind>(record.kind)).name) + "Ret"
+                 : retName(kind),
+             std::move(fields)};
 }
 
 std::optional<Balances> balancesFor(Context& context, ListTable table) {
@@ -265,8 +270,9 @@ Answer addEntry(Context& context, const XmlNode& request, const ListKind& kind) 
   record.modified = context.now;
   context.store.insertList(kind.table, record);
   const Balances balances = Balances::ofNewEntry(record);
-  context.add(answer, listRet(context, kind, std::move(record),
-                              kind.table == ListTable::Items ? nullptr : &balances));
+  const Ret ret = listRet(context, kind, std::move(record),
+                          kind.table == ListTable::Items ? nullptr : &balances);
+  context.add(answer, ret.name, ret.fields);
   return answer;
 }
 
@@ -357,8 +363,8 @@ Answer queryEntries(Context& context, const XmlNode& request, const ListKind& ki
   const bool named = request.child("ListID") != nullptr || request.child("FullName") != nullptr;
   const auto balances = balancesFor(context, kind.table);
   const auto add = [&](ListRecord record) {
-    context.add(answer, filter.included(listRet(context, kind, std::move(record),
-                                                balances ? &*balances : nullptr)));
+    const Ret ret = listRet(context, kind, std::move(record), balances ? &*balances : nullptr);
+    context.add(answer, ret.name, ret.fields, filter.includeRetElements);
   };
   if (named) {
     for (ListRecord& record : namedEntries(context, request, kind.table, kinds, missing)) {

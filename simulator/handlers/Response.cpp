@@ -160,39 +160,55 @@ QbxmlVersion QbxmlVersion::parse(std::string_view text) {
   return version.major == 0 ? QbxmlVersion{} : version;
 }
 
-std::vector<Field> SchemaOrder::arrange(std::string_view aggregate, std::vector<Field> fields) {
+const std::vector<size_t>& SchemaOrder::places(std::string_view aggregate,
+                                               const std::vector<Field>& fields) {
   auto found = last_.find(aggregate);
   if (found == last_.end()) found = last_.emplace(std::string(aggregate), Arrangement{}).first;
   Arrangement& last = found->second;
   const bool same =
       std::equal(fields.begin(), fields.end(), last.names.begin(), last.names.end(),
                  [](const Field& field, const std::string& name) { return field.name == name; });
-  if (!same) {
-    last.names.clear();
-    last.order.clear();
-    const int index = internal::findAggregate(aggregate);
-    // Each kept field's place in the schema order, then its place among the fields, so that
-    // fields of one place keep theirs.
-    std::vector<std::pair<int, size_t>> ranked;
-    for (size_t at = 0; at < fields.size(); ++at) {
-      last.names.push_back(fields[at].name);
-      const int rank =
-          index < 0 ? -1
-                    : internal::automatonOf(index).rankOf(choiceRepresentative(fields[at].name));
-      if (rank < 0 || !writtenInVersion(aggregate, fields[at].name, version_)) continue;
-      ranked.emplace_back(rank, at);
-    }
-    std::sort(ranked.begin(), ranked.end());
-    for (const auto& [rank, at] : ranked) last.order.push_back(at);
+  if (same) return last.order;
+  last.names.clear();
+  last.order.clear();
+  const int index = internal::findAggregate(aggregate);
+  // Each kept field's place in the schema order, then its place among the fields, so that
+  // fields of one place keep theirs.
+  std::vector<std::pair<int, size_t>> ranked;
+  for (size_t at = 0; at < fields.size(); ++at) {
+    last.names.push_back(fields[at].name);
+    const int rank =
+        index < 0 ? -1 : internal::automatonOf(index).rankOf(choiceRepresentative(fields[at].name));
+    if (rank < 0 || !writtenInVersion(aggregate, fields[at].name, version_)) continue;
+    ranked.emplace_back(rank, at);
   }
+  std::sort(ranked.begin(), ranked.end());
+  for (const auto& [rank, at] : ranked) last.order.push_back(at);
+  return last.order;
+}
+
+std::vector<Field> SchemaOrder::arrange(std::string_view aggregate, std::vector<Field> fields) {
+  const std::vector<size_t>& kept = places(aggregate, fields);
   std::vector<Field> result;
-  result.reserve(last.order.size());
-  for (const size_t at : last.order) result.push_back(std::move(fields[at]));
+  result.reserve(kept.size());
+  for (const size_t at : kept) result.push_back(std::move(fields[at]));
   return result;
 }
 
 void writeRecord(std::string& out, const Field& record, Store& store) {
   appendField(out, record, store);
+}
+
+void writeRecord(std::string& out, std::string_view aggregate, const std::vector<Field>& fields,
+                 const std::vector<size_t>& places, Store& store) {
+  // As appendField writes the aggregate of these fields: nothing when none has content.
+  if (std::none_of(places.begin(), places.end(),
+                   [&](size_t at) { return hasContent(fields[at]); })) {
+    return;
+  }
+  appendTag(out, "<", aggregate);
+  for (const size_t at : places) appendField(out, fields[at], store);
+  appendTag(out, "</", aggregate);
 }
 
 void finishAnswer(std::string& out, size_t start, const Answer& answer) {

@@ -50,6 +50,8 @@ class SchemaOrder {
   // `fields` in the order of `aggregate`. Fields the aggregate does not hold are left out, and
   // so are the elements QuickBooks did not yet write in the document's qbXML version.
   std::vector<Field> arrange(std::string_view aggregate, std::vector<Field> fields);
+  // The places among `fields` of the fields arrange() keeps, in the order it puts them.
+  const std::vector<size_t>& places(std::string_view aggregate, const std::vector<Field>& fields);
 
  private:
   struct Arrangement {
@@ -64,6 +66,9 @@ class SchemaOrder {
 // Appends the text of one record (LF-ended lines); references are written with the ListID and
 // FullName the store finds for them.
 void writeRecord(std::string& out, const Field& record, Store& store);
+// The same for the record `aggregate` holding fields[at] for each `at` of `places`, in that order.
+void writeRecord(std::string& out, std::string_view aggregate, const std::vector<Field>& fields,
+                 const std::vector<size_t>& places, Store& store);
 
 // Completes the response element of `answer`, whose records `out` holds from `start` on: its
 // start tag, which carries the status, goes in front of them.
