@@ -19,12 +19,15 @@ Context::Context(CompanyFile& company, Store& store, QbxmlVersion version, std::
       response(response) {}
 
 void Context::add(Answer& answer, const Field& record) {
+  const size_t start = response.size();
   writeRecord(response, record, store);
+  lastRecord_ = response.size() - start;
   ++answer.count;
 }
 
 void Context::add(Answer& answer, std::string_view aggregate, const std::vector<Field>& fields,
                   const std::vector<std::string>& included) {
+  const size_t start = response.size();
   const std::vector<size_t>& places = order.places(aggregate, fields);
   if (included.empty()) {
     writeRecord(response, aggregate, fields, places, store);
@@ -35,7 +38,13 @@ void Context::add(Answer& answer, std::string_view aggregate, const std::vector<
     });
     writeRecord(response, aggregate, fields, kept, store);
   }
+  lastRecord_ = response.size() - start;
   ++answer.count;
+}
+
+void Context::expect(size_t records) {
+  // A quarter more, as records differ in length.
+  response.reserve(response.size() + records * lastRecord_ / 4 * 5);
 }
 
 const std::string& Context::dateTimeText(int64_t time) {

@@ -36,6 +36,9 @@ class Context {
   // the fields named in `included` when it names any.
   void add(Answer& answer, std::string_view aggregate, const std::vector<Field>& fields,
            const std::vector<std::string>& included = {});
+  // Makes room in the response for `records` more like the last one written: a long list's text
+  // then grows once instead of being copied through every doubling on its way up.
+  void expect(size_t records);
   // formatDateTime(time), remembered for the last time asked: the entries of a list come in
   // runs made in the same second.
   const std::string& dateTimeText(int64_t time);
@@ -52,6 +55,7 @@ class Context {
   void forgetLookups();
 
  private:
+  size_t lastRecord_ = 0;  // the length of the last record written
   std::optional<std::pair<int64_t, std::string>> lastDateTime_;
   std::map<std::string, std::optional<int64_t>> specialAccounts_;
   std::map<int64_t, bool> taxable_;

@@ -3,6 +3,7 @@
 // the completing function it names.
 #include <algorithm>
 #include <array>
+#include <cstdint>
 #include <map>
 #include <set>
 
@@ -301,9 +302,15 @@ std::vector<ListRecord> namedEntries(Context& context, const XmlNode& request, L
   return records;
 }
 
-// The statement selecting the entries a query's filters select, in the list's order.
-Statement& filteredEntries(Context& context, const XmlNode& request, ListTable table,
-                           const std::vector<int>& kinds, const QueryFilter& filter) {
+// The entries a query's filters select: a statement over them in the list's order, and how many
+// they are.
+struct Selection {
+  Statement& rows;
+  int64_t count;
+};
+
+Selection filteredEntries(Context& context, const XmlNode& request, ListTable table,
+                          const std::vector<int>& kinds, const QueryFilter& filter) {
   Conditions conditions;
   if (!kinds.empty()) {
     std::string in;
@@ -345,14 +352,17 @@ Statement& filteredEntries(Context& context, const XmlNode& request, ListTable t
   }
   if (!types.empty()) conditions.add("kind IN (" + typeList + ")", std::move(types));
 
+  const std::string from = " FROM " + std::string(Store::tableName(table)) + conditions.where();
+  Statement& count = context.store.statement("SELECT count(*)" + from);
+  conditions.bind(count);
+  count.step();
   // Hierarchical order: a parent, then its children, then the next name ("A", "A:B", "A B").
   Statement& rows = context.store.statement(
-      "SELECT " + std::string(Store::kListColumns) + " FROM " +
-      std::string(Store::tableName(table)) + conditions.where() +
+      "SELECT " + std::string(Store::kListColumns) + from +
       (table == ListTable::Customers ? " ORDER BY " : " ORDER BY kind, ") +
       "replace(full_name, ':', char(1)) COLLATE NOCASE, id" + filter.limit());
   conditions.bind(rows);
-  return rows;
+  return {rows, std::min(count.integer(0), filter.maxReturned.value_or(INT64_MAX))};
 }
 
 Answer queryEntries(Context& context, const XmlNode& request, const ListKind& kind,
@@ -371,8 +381,11 @@ Answer queryEntries(Context& context, const XmlNode& request, const ListKind& ki
       add(std::move(record));
     }
   } else {
-    Statement& rows = filteredEntries(context, request, kind.table, kinds, filter);
-    while (rows.step()) add(Store::listRecord(rows));
+    const Selection selection = filteredEntries(context, request, kind.table, kinds, filter);
+    for (int64_t read = 0; selection.rows.step(); ++read) {
+      add(Store::listRecord(selection.rows));
+      if (read == 0) context.expect(static_cast<size_t>(selection.count - 1));
+    }
   }
   finishQuery(answer, missing);
   return answer;
