@@ -67,7 +67,7 @@ class CompanyFile {
   sqlite3* db() const noexcept { return db_; }
   // The company's name and sales tax setting, as the file was created with them (read when it
   // was opened: nothing changes them).
-  const CompanySettings& settings() const noexcept { return settings_; }
+  CompanySettings settings() const { return settings_; }
 
   // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting up to 10 s
   // for another process's transaction to end); rolls back and rethrows when `work` throws.
