@@ -154,7 +154,7 @@ int reportResponse(Io io, const Session& session, OutputFormat format) {
     return kExitConnection;
   }
   std::string error;
-  const auto document = parseResponse(*journal.response, error);
+  const auto document = parseResponse(*journal.response, error, format == OutputFormat::Json);
   if (!document) {
     io.out << *journal.response;
     io.err << "droqbxml: the response is not a qbXML response document: " << error << '\n';
@@ -355,10 +355,13 @@ bool Session::open() {
 }
 
 Text Session::send(const Text& request) {
-  trace(u"Request:\r\n" + request);
+  // Only with a trace file: a list's response is megabytes to copy.
+  if (tracer_) trace(u"Request:\r\n" + request);
   Text response = facade_->API()->ProcessRequest(request);
-  trace(u"Response (" + fromUtf8(statusText(status())) + u"):\r\n" +
-        (journal_->response ? fromUtf8(*journal_->response) : response));
+  if (tracer_) {
+    trace(u"Response (" + fromUtf8(statusText(status())) + u"):\r\n" +
+          (journal_->response ? fromUtf8(*journal_->response) : response));
+  }
   return response;
 }
 

@@ -3,6 +3,8 @@
 
 #include <expat.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <memory>
 #include <nlohmann/json.hpp>
 
@@ -11,14 +13,23 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
+// The response elements' depth: QBXML, QBXMLMsgsRs, then the responses.
+constexpr size_t kResponseDepth = 3;
+
 struct Builder {
   XmlElement root;
   std::vector<XmlElement*> open;
   bool haveRoot = false;
+  size_t keptDepth = SIZE_MAX;  // elements deeper than this are only counted
+  size_t skipped = 0;           // how many such elements are open
 };
 
 void XMLCALL startElement(void* data, const XML_Char* name, const XML_Char** attributes) {
   auto& builder = *static_cast<Builder*>(data);
+  if (builder.skipped > 0 || builder.open.size() == builder.keptDepth) {
+    ++builder.skipped;
+    return;
+  }
   XmlElement* element = nullptr;
   if (builder.open.empty()) {
     element = &builder.root;
@@ -34,12 +45,19 @@ void XMLCALL startElement(void* data, const XML_Char* name, const XML_Char** att
 }
 
 void XMLCALL endElement(void* data, const XML_Char* /*name*/) {
-  static_cast<Builder*>(data)->open.pop_back();
+  auto& builder = *static_cast<Builder*>(data);
+  if (builder.skipped > 0) {
+    --builder.skipped;
+  } else {
+    builder.open.pop_back();
+  }
 }
 
 void XMLCALL characters(void* data, const XML_Char* text, int length) {
   auto& builder = *static_cast<Builder*>(data);
-  if (!builder.open.empty()) builder.open.back()->text.append(text, static_cast<size_t>(length));
+  if (!builder.open.empty() && builder.skipped == 0) {
+    builder.open.back()->text.append(text, static_cast<size_t>(length));
+  }
 }
 
 const XmlElement* childNamed(const XmlElement& element, std::string_view name) {
@@ -92,18 +110,27 @@ std::vector<const XmlElement*> ResponseDocument::responses() const {
   return found;
 }
 
-std::optional<ResponseDocument> parseResponse(std::string_view xml, std::string& error) {
+std::optional<ResponseDocument> parseResponse(std::string_view xml, std::string& error,
+                                              bool records) {
   const std::unique_ptr<XML_ParserStruct, decltype(&XML_ParserFree)> parser(
       XML_ParserCreate("UTF-8"), &XML_ParserFree);
   Builder builder;
+  if (!records) builder.keptDepth = kResponseDepth;
   XML_SetUserData(parser.get(), &builder);
   XML_SetElementHandler(parser.get(), startElement, endElement);
   XML_SetCharacterDataHandler(parser.get(), characters);
-  if (XML_Parse(parser.get(), xml.data(), static_cast<int>(xml.size()), XML_TRUE) !=
-      XML_STATUS_OK) {
-    error = "line " + std::to_string(XML_GetCurrentLineNumber(parser.get())) + ": " +
-            XML_ErrorString(XML_GetErrorCode(parser.get()));
-    return std::nullopt;
+  // In pieces: Expat copies what it is given, and a whole list's response is megabytes.
+  constexpr size_t kPiece = 1 << 16;
+  for (size_t at = 0;; at += kPiece) {
+    const std::string_view piece = xml.substr(std::min(at, xml.size()), kPiece);
+    const bool last = at + kPiece >= xml.size();
+    if (XML_Parse(parser.get(), piece.data(), static_cast<int>(piece.size()),
+                  last ? XML_TRUE : XML_FALSE) != XML_STATUS_OK) {
+      error = "line " + std::to_string(XML_GetCurrentLineNumber(parser.get())) + ": " +
+              XML_ErrorString(XML_GetErrorCode(parser.get()));
+      return std::nullopt;
+    }
+    if (last) break;
   }
   ResponseDocument document{std::move(builder.root)};
   if (document.root.name != "QBXML" || childNamed(document.root, "QBXMLMsgsRs") == nullptr) {

@@ -223,6 +223,36 @@ bool hasTable(sqlite3* db, std::string_view table) {
   return found.step();
 }
 
+// Rewinds a kept statement when it goes out of scope, however its use ends.
+using Rewind = std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)>;
+
+// The statements a company file keeps prepared (CompanyFile::kept_), by their place.
+enum Kept : size_t { kBegin, kCommit, kCountOn, kCountFrom, kCounterValue };
+constexpr std::array<std::string_view, 5> kKeptSql{{
+    "BEGIN IMMEDIATE",
+    "COMMIT",
+    "UPDATE counters SET value = value + ?2 WHERE name = ?1",
+    "INSERT INTO counters (name, value) VALUES (?1, ?2)",
+    "SELECT value FROM counters WHERE name = ?1",
+}};
+
+// Runs a statement without rows to its end.
+void run(sqlite3* db, sqlite3_stmt* statement) {
+  const int result = sqlite3_step(statement);
+  if (result != SQLITE_DONE) failSqlite(db, result, sqlite3_sql(statement));
+}
+
+CompanySettings readSettings(sqlite3* db) {
+  CompanySettings settings;
+  Statement rows(db, "SELECT key, value FROM settings");
+  while (rows.step()) {
+    const std::string key = rows.text(0);
+    if (key == kCompanyNameKey) settings.companyName = rows.text(1);
+    if (key == kSalesTaxKey) settings.salesTax = rows.text(1) == "1";
+  }
+  return settings;
+}
+
 }  // namespace
 
 void CompanyFile::create(const std::filesystem::path& path, const CompanySettings& settings) {
@@ -314,29 +344,42 @@ CompanyFile::CompanyFile(const std::filesystem::path& path, Mode mode) : path_(p
   }
 
   configure(db.get());
+  settings_ = readSettings(db.get());
   db_ = db.release();
 }
 
-CompanyFile::~CompanyFile() { sqlite3_close_v2(db_); }
+CompanyFile::~CompanyFile() {
+  for (sqlite3_stmt* statement : kept_) sqlite3_finalize(statement);
+  sqlite3_close_v2(db_);
+}
 
-CompanySettings CompanyFile::settings() const {
-  CompanySettings settings;
-  Statement rows(db_, "SELECT key, value FROM settings");
-  while (rows.step()) {
-    const std::string key = rows.text(0);
-    if (key == kCompanyNameKey) settings.companyName = rows.text(1);
-    if (key == kSalesTaxKey) settings.salesTax = rows.text(1) == "1";
+sqlite3_stmt* CompanyFile::kept(size_t which) {
+  static_assert(std::tuple_size_v<decltype(kept_)> == kKeptSql.size());
+  sqlite3_stmt*& slot = kept_[which];
+  if (slot == nullptr) {
+    const std::string_view sql = kKeptSql[which];
+    const int prepared = sqlite3_prepare_v3(db_, sql.data(), static_cast<int>(sql.size()),
+                                            SQLITE_PREPARE_PERSISTENT, &slot, nullptr);
+    if (prepared != SQLITE_OK) failSqlite(db_, prepared, sql);
   }
-  return settings;
+  return slot;
 }
 
 void CompanyFile::inTransaction(const std::function<void()>& work) {
   // Inside a transaction already: a savepoint, so that the inner work alone is undone.
   const bool nested = sqlite3_get_autocommit(db_) == 0;
-  execute(db_, nested ? "SAVEPOINT inner_work" : "BEGIN IMMEDIATE");
+  if (nested) {
+    execute(db_, "SAVEPOINT inner_work");
+  } else {
+    run(db_, Rewind(kept(kBegin), sqlite3_reset).get());
+  }
   try {
     work();
-    execute(db_, nested ? "RELEASE inner_work" : "COMMIT");
+    if (nested) {
+      execute(db_, "RELEASE inner_work");
+    } else {
+      run(db_, Rewind(kept(kCommit), sqlite3_reset).get());
+    }
   } catch (...) {
     // SQLite may have rolled back on its own (a full disk, an I/O error).
     if (sqlite3_get_autocommit(db_) == 0) {
@@ -347,15 +390,25 @@ void CompanyFile::inTransaction(const std::function<void()>& work) {
   }
 }
 
-int64_t CompanyFile::nextCounter(std::string_view counter) {
-  Statement next(db_,
-                 "INSERT INTO counters (name, value) VALUES (?, 1) "
-                 "ON CONFLICT (name) DO UPDATE SET value = value + 1 RETURNING value");
-  next.bind(1, counter);
-  if (!next.step()) failSqlite(db_, SQLITE_ERROR, "nextCounter");
-  const int64_t value = next.integer(0);
-  next.step();
-  return value;
+int64_t CompanyFile::nextCounter(std::string_view counter, int64_t count) {
+  // Each statement rewound however its use ends, so that none holds anything between calls.
+  const auto bound = [&](Kept which) {
+    Rewind statement(kept(which), sqlite3_reset);
+    sqlite3_bind_text(statement.get(), 1, counter.data(), static_cast<int>(counter.size()),
+                      SQLITE_TRANSIENT);
+    if (sqlite3_bind_parameter_count(statement.get()) > 1) {
+      sqlite3_bind_int64(statement.get(), 2, count);
+    }
+    return statement;
+  };
+  // Counted on, or started when the file has no such counter yet.
+  run(db_, bound(kCountOn).get());
+  if (sqlite3_changes(db_) == 0) run(db_, bound(kCountFrom).get());
+  const Rewind value = bound(kCounterValue);
+  const int result = sqlite3_step(value.get());
+  if (result == SQLITE_DONE) failSqlite(db_, SQLITE_ERROR, "nextCounter");
+  if (result != SQLITE_ROW) failSqlite(db_, result, kKeptSql[kCounterValue]);
+  return sqlite3_column_int64(value.get(), 0) - count + 1;
 }
 
 std::optional<ApplicationAccess> CompanyFile::application(std::string_view appName) const {

@@ -5,6 +5,7 @@
 #ifndef DROQBXML_SIMULATOR_COMPANYFILE_HPP_
 #define DROQBXML_SIMULATOR_COMPANYFILE_HPP_
 
+#include <array>
 #include <cstdint>
 #include <filesystem>
 #include <functional>
@@ -15,6 +16,7 @@
 #include <vector>
 
 struct sqlite3;
+struct sqlite3_stmt;
 
 namespace droqbxml::simulator {
 
@@ -70,7 +72,9 @@ class CompanyFile {
 
   const std::filesystem::path& path() const noexcept { return path_; }
   sqlite3* db() const noexcept { return db_; }
-  CompanySettings settings() const;
+  // The company's name and sales tax setting, as the file was created with them (read when it
+  // was opened: nothing changes them).
+  CompanySettings settings() const { return settings_; }
 
   // Runs `work` inside one write transaction (BEGIN IMMEDIATE ... COMMIT, waiting up to 10 s
   // for another process's transaction to end); rolls back and rethrows when `work` throws.
@@ -80,8 +84,9 @@ class CompanyFile {
   void inTransaction(const std::function<void()>& work);
 
   // The next value of a named counter kept in the file (1, 2, ...), for list and
-  // transaction identifiers and numbers. Call it inside a transaction.
-  int64_t nextCounter(std::string_view counter);
+  // transaction identifiers and numbers; with `count`, the first of that many consecutive
+  // values, all taken. Call it inside a transaction.
+  int64_t nextCounter(std::string_view counter, int64_t count = 1);
 
   // The integrated-application list, by exact application name: nothing for an application
   // the file has not seen. setApplication adds or changes an entry in its own transaction.
@@ -93,8 +98,13 @@ class CompanyFile {
   std::string summary() const;
 
  private:
+  // The statement kept in kept_[which], prepared when first used.
+  sqlite3_stmt* kept(size_t which);
+
   std::filesystem::path path_;
   sqlite3* db_ = nullptr;
+  CompanySettings settings_;
+  std::array<sqlite3_stmt*, 5> kept_{};  // a transaction's and nextCounter's statements
 };
 
 }  // namespace droqbxml::simulator

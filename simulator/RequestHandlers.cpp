@@ -96,7 +96,8 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings) {
   handlers::addStandardLists(store, settings, handlers::currentTime());
 }
 
-std::string answerRequests(CompanyFile& company, const RequestDocument& document) {
+void answerRequests(CompanyFile& company, const RequestDocument& document,
+                    handlers::StatementCache* kept, std::string& response) {
   const XmlNode* messages = document.root.child("QBXMLMsgsRq");
   if (messages == nullptr) refuseDocument();
   const std::string onError = messages->attribute("onError").value_or("stopOnError");
@@ -105,35 +106,44 @@ std::string answerRequests(CompanyFile& company, const RequestDocument& document
   // without it.
   if (!internal::isKnownVersion(document.qbxmlVersion)) refuseDocument();
 
-  handlers::Store store(company.db());
-  handlers::Context context(company, store, handlers::QbxmlVersion::parse(document.qbxmlVersion));
-  std::string answers;
+  response.assign(handlers::kResponseStart);
+  handlers::Store store(company.db(), kept);
+  handlers::Context context(company, store, handlers::QbxmlVersion::parse(document.qbxmlVersion),
+                            response);
   for (std::size_t index = 0; index < messages->children.size(); ++index) {
     const XmlNode& request = messages->children[index];
     context.now = handlers::currentTime();
-    std::string text;
+    const std::size_t start = response.size();
     bool refused = false;
     try {
       const Handler handler = handlerFor(request.name);
       if (handler == nullptr) throw handlers::Refusal(handlers::status::unsupported());
       company.inTransaction([&] {
-        text = handlers::writeAnswer(handler(context, request), store);
+        const Answer answer = handler(context, request);
         if (auto status = valueRefusal(document, index)) {
           throw handlers::Refusal(std::move(*status));
         }
+        handlers::finishAnswer(response, start, answer);
       });
     } catch (const handlers::Refusal& refusal) {
       context.forgetLookups();
+      response.resize(start);
       Answer answer = handlers::answerTo(request);
       answer.status = refusal.status();
-      text = handlers::writeAnswer(answer, store);
+      handlers::finishAnswer(response, start, answer);
       refused = refusal.status().isError();
     }
-    store.resetStatements();
-    answers += text;
+    store.endRequest();
     if (refused && onError == "stopOnError") break;
   }
-  return handlers::responseDocument(answers);
+  response += handlers::kResponseEnd;
+}
+
+std::string answerRequests(CompanyFile& company, const RequestDocument& document,
+                           handlers::StatementCache* kept) {
+  std::string response;
+  answerRequests(company, document, kept, response);
+  return response;
 }
 
 }  // namespace droqbxml::simulator

@@ -235,7 +235,9 @@ Text SimulatedProcessor::BeginSession(const Text& qbFile, QBFileMode /*mode*/) {
   admit(*company, appName_);
 
   Text ticket = newTicket();
-  sessions_.emplace(ticket, Session{std::move(path), std::move(company)});
+  auto statements = std::make_unique<handlers::StatementCache>(company->db());
+  sessions_.emplace(ticket,
+                    Session{std::move(path), std::move(company), std::move(statements), {}});
   guard.keep();
   return ticket;
 }
@@ -248,7 +250,10 @@ Text SimulatedProcessor::ProcessRequest(const Text& ticket, const Text& request)
   // Values QuickBooks answers per request (too long, too many decimals) leave the document
   // readable; anything else is its parse error.
   if (!read.document) raise(Failure::Parse);
-  return onCompanyFile([&] { return fromUtf8(answerRequests(*session.company, *read.document)); });
+  return onCompanyFile([&] {
+    answerRequests(*session.company, *read.document, session.statements.get(), session.response);
+    return fromUtf8(session.response);
+  });
 }
 
 void SimulatedProcessor::EndSession(const Text& ticket) {

@@ -103,17 +103,35 @@ std::string formatDateTime(int64_t unixTime) {
   const int offset = localOffsetAt(unixTime);
   const int64_t local = unixTime + offset;
   const int64_t days = (local >= 0 ? local : local - 86399) / 86400;
-  const int64_t secondOfDay = local - days * 86400;
+  const auto secondOfDay = static_cast<int>(local - days * 86400);
   int year = 0;
   int month = 0;
   int day = 0;
   civilFromDays(days, year, month, day);
   const int magnitude = offset < 0 ? -offset : offset;
-  char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02dT%02d:%02d:%02d%c%02d:%02d", year, month, day,
-                static_cast<int>(secondOfDay / 3600), static_cast<int>(secondOfDay / 60 % 60),
-                static_cast<int>(secondOfDay % 60), offset < 0 ? '-' : '+', magnitude / 3600,
-                magnitude / 60 % 60);
+  if (year < 0 || year > 9999 || magnitude / 3600 > 99) {
+    char text[40];
+    std::snprintf(text, sizeof text, "%04d-%02d-%02dT%02d:%02d:%02d%c%02d:%02d", year, month, day,
+                  secondOfDay / 3600, secondOfDay / 60 % 60, secondOfDay % 60,
+                  offset < 0 ? '-' : '+', magnitude / 3600, magnitude / 60 % 60);
+    return text;
+  }
+  // "yyyy-mm-ddThh:mm:ss+hh:mm", written digit by digit: a query writes one per record.
+  std::string text = "0000-00-00T00:00:00+00:00";
+  const auto put = [&](size_t at, int value, int width) {
+    for (size_t end = at + static_cast<size_t>(width); end > at; value /= 10) {
+      text[--end] = static_cast<char>('0' + value % 10);
+    }
+  };
+  put(0, year, 4);
+  put(5, month, 2);
+  put(8, day, 2);
+  put(11, secondOfDay / 3600, 2);
+  put(14, secondOfDay / 60 % 60, 2);
+  put(17, secondOfDay % 60, 2);
+  text[19] = offset < 0 ? '-' : '+';
+  put(20, magnitude / 3600, 2);
+  put(23, magnitude / 60 % 60, 2);
   return text;
 }
 

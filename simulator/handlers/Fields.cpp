@@ -114,20 +114,20 @@ class Reader {
     damaged();
   }
 
-  std::string text() {
+  std::string_view text() {
     const uint64_t length = number();
     if (length > blob_.size() - position_) damaged();
-    std::string result(blob_.substr(position_, length));
+    const std::string_view result = blob_.substr(position_, length);
     position_ += length;
     return result;
   }
 
-  Field field(int depth) {
+  // Reads the next field into `result`, a field made for it where it is kept.
+  void field(Field& result, int depth) {
     if (depth > 16) damaged();
     const uint64_t header = number();
     const uint64_t code = header / 4;
     const auto kind = header % 4;
-    Field result;
     if (code == 0) {
       result.name = text();
     } else if (code <= kElementNames.size()) {
@@ -144,7 +144,8 @@ class Reader {
         result.kind = Field::Kind::Aggregate;
         const uint64_t count = number();
         if (count > blob_.size()) damaged();
-        for (uint64_t i = 0; i < count; ++i) result.children.push_back(field(depth + 1));
+        result.children.resize(count);
+        for (Field& child : result.children) field(child, depth + 1);
         break;
       }
       case 2:
@@ -155,7 +156,6 @@ class Reader {
       default:
         damaged();
     }
-    return result;
   }
 
  private:
@@ -209,6 +209,12 @@ std::string fieldText(const std::vector<Field>& fields, std::string_view name) {
   return field != nullptr && field->kind == Field::Kind::Value ? field->text : std::string();
 }
 
+void appendValue(std::vector<Field>& fields, std::string_view name, std::string text) {
+  Field& field = fields.emplace_back();
+  field.name = name;
+  field.text = std::move(text);
+}
+
 void setField(std::vector<Field>& fields, Field field) {
   removeField(fields, field.name);
   fields.push_back(std::move(field));
@@ -224,10 +230,11 @@ std::string encodeFields(const std::vector<Field>& fields) {
   return out;
 }
 
-std::vector<Field> decodeFields(std::string_view blob) {
+std::vector<Field> decodeFields(std::string_view blob, size_t room) {
   Reader reader(blob);
   std::vector<Field> fields;
-  while (!reader.done()) fields.push_back(reader.field(0));
+  fields.reserve(16 + room);
+  while (!reader.done()) reader.field(fields.emplace_back(), 0);
   return fields;
 }
 

@@ -36,6 +36,9 @@ struct Field {
 const Field* findField(const std::vector<Field>& fields, std::string_view name);
 // The text of the first value field of that name, or the empty text.
 std::string fieldText(const std::vector<Field>& fields, std::string_view name);
+// Appends the value field `name` holding `text`, made where it is kept (records of a long list
+// are built field by field).
+void appendValue(std::vector<Field>& fields, std::string_view name, std::string text);
 // Replaces every field of that name by `field`, or appends it when there is none.
 void setField(std::vector<Field>& fields, Field field);
 void removeField(std::vector<Field>& fields, std::string_view name);
@@ -43,8 +46,9 @@ void removeField(std::vector<Field>& fields, std::string_view name);
 // The compact form a company file keeps: element names as numbers of a fixed, append-only
 // table (unknown names inline), lengths and rows as variable-length integers.
 std::string encodeFields(const std::vector<Field>& fields);
-// The inverse of encodeFields; a blob that is not one raises std::runtime_error.
-std::vector<Field> decodeFields(std::string_view blob);
+// The inverse of encodeFields; a blob that is not one raises std::runtime_error. `room`: how
+// many fields the caller is about to add.
+std::vector<Field> decodeFields(std::string_view blob, size_t room = 0);
 
 }  // namespace droqbxml::simulator::handlers
 

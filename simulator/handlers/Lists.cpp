@@ -3,6 +3,7 @@
 // the completing function it names.
 #include <algorithm>
 #include <array>
+#include <cstdint>
 #include <map>
 #include <set>
 
@@ -183,42 +184,45 @@ class Balances {
   std::map<int64_t, int64_t> total_;
 };
 
+// A Ret aggregate: its name and its fields, not yet in schema order.
+struct Ret {
+  std::string name;
+  std::vector<Field> fields;
+};
+
 // The Ret aggregate of a list entry: the list core, what the entry keeps, and what QuickBooks
 // works out for it (balances, an account's type and cash-flow class).
-Field listRet(Context& context, const ListKind& kind, const ListRecord& record,
-              const Balances* balances) {
-  std::vector<Field> fields = record.fields;
+Ret listRet(Context& context, const ListKind& kind, ListRecord record, const Balances* balances) {
+  std::vector<Field> fields = std::move(record.fields);
+  fields.reserve(fields.size() + Store::kRetRoom);  // what follows adds at most this many
   std::string name = record.fullName;
   if (record.parent) {
     const std::string& parentName = context.store.identity(kind.table, *record.parent).fullName;
     name = record.fullName.substr(std::min(record.fullName.size(), parentName.size() + 1));
     fields.push_back(Field::reference("ParentRef", kind.table, *record.parent));
   }
-  fields.push_back(Field::value("ListID", listIdText(record.id, record.created)));
-  fields.push_back(Field::value("TimeCreated", formatDateTime(record.created)));
-  fields.push_back(Field::value("TimeModified", formatDateTime(record.modified)));
-  fields.push_back(Field::value("EditSequence", std::to_string(record.modified)));
-  fields.push_back(Field::value("Name", name));
-  fields.push_back(Field::value("FullName", record.fullName));
-  fields.push_back(Field::value("IsActive", record.active ? "true" : "false"));
-  fields.push_back(Field::value("Sublevel", std::to_string(record.sublevel)));
+  appendValue(fields, "ListID", listIdText(record.id, record.created));
+  appendValue(fields, "TimeCreated", context.dateTimeText(record.created));
+  appendValue(fields, "TimeModified", context.dateTimeText(record.modified));
+  appendValue(fields, "EditSequence", std::to_string(record.modified));
+  appendValue(fields, "Name", std::move(name));
+  appendValue(fields, "FullName", std::move(record.fullName));
+  appendValue(fields, "IsActive", record.active ? "true" : "false");
+  appendValue(fields, "Sublevel", std::to_string(record.sublevel));
   if (balances != nullptr) {
-    fields.push_back(
-        Field::value("Balance", formatNumber(balances->own(record.id), NumberKind::Amount)));
-    fields.push_back(
-        Field::value("TotalBalance", formatNumber(balances->total(record.id), NumberKind::Amount)));
+    appendValue(fields, "Balance", formatNumber(balances->own(record.id), NumberKind::Amount));
+    appendValue(fields, "TotalBalance",
+                formatNumber(balances->total(record.id), NumberKind::Amount));
   }
   if (kind.table == ListTable::Accounts) {
     const std::string_view type = accountTypeOfRank(record.kind);
-    fields.push_back(Field::value("AccountType", std::string(type)));
-    fields.push_back(
-        Field::value("CashFlowClassification", std::string(cashFlowClassification(type))));
+    appendValue(fields, "AccountType", std::string(type));
+    appendValue(fields, "CashFlowClassification", std::string(cashFlowClassification(type)));
   }
-  const std::string ret =
-      kind.table == ListTable::Items
-          ? std::string(itemKindInfo(static_cast<ItemKind>(record.kind)).name) + "Ret"
-          : retName(kind);
-  return Field::aggregate(ret, inSchemaOrder(ret, std::move(fields), context.version));
+  return Ret{kind.table == ListTable::Items
+                 ? std::string(itemKindInfo(static_cast<ItemKind>(record.kind)).name) + "Ret"
+                 : retName(kind),
+             std::move(fields)};
 }
 
 std::optional<Balances> balancesFor(Context& context, ListTable table) {
@@ -267,8 +271,9 @@ Answer addEntry(Context& context, const XmlNode& request, const ListKind& kind) 
   record.modified = context.now;
   context.store.insertList(kind.table, record);
   const Balances balances = Balances::ofNewEntry(record);
-  answer.records.push_back(
-      listRet(context, kind, record, kind.table == ListTable::Items ? nullptr : &balances));
+  const Ret ret = listRet(context, kind, std::move(record),
+                          kind.table == ListTable::Items ? nullptr : &balances);
+  context.add(answer, ret.name, ret.fields);
   return answer;
 }
 
@@ -297,9 +302,15 @@ std::vector<ListRecord> namedEntries(Context& context, const XmlNode& request, L
   return records;
 }
 
-// The entries a query's filters select, in the list's order.
-std::vector<ListRecord> filteredEntries(Context& context, const XmlNode& request, ListTable table,
-                                        const std::vector<int>& kinds, const QueryFilter& filter) {
+// The entries a query's filters select: a statement over them in the list's order, and how many
+// they are.
+struct Selection {
+  Statement& rows;
+  int64_t count;
+};
+
+Selection filteredEntries(Context& context, const XmlNode& request, ListTable table,
+                          const std::vector<int>& kinds, const QueryFilter& filter) {
   Conditions conditions;
   if (!kinds.empty()) {
     std::string in;
@@ -341,16 +352,17 @@ std::vector<ListRecord> filteredEntries(Context& context, const XmlNode& request
   }
   if (!types.empty()) conditions.add("kind IN (" + typeList + ")", std::move(types));
 
+  const std::string from = " FROM " + std::string(Store::tableName(table)) + conditions.where();
+  Statement& count = context.store.statement("SELECT count(*)" + from);
+  conditions.bind(count);
+  count.step();
   // Hierarchical order: a parent, then its children, then the next name ("A", "A:B", "A B").
   Statement& rows = context.store.statement(
-      "SELECT " + std::string(Store::kListColumns) + " FROM " +
-      std::string(Store::tableName(table)) + conditions.where() +
+      "SELECT " + std::string(Store::kListColumns) + from +
       (table == ListTable::Customers ? " ORDER BY " : " ORDER BY kind, ") +
       "replace(full_name, ':', char(1)) COLLATE NOCASE, id" + filter.limit());
   conditions.bind(rows);
-  std::vector<ListRecord> records;
-  while (rows.step()) records.push_back(Store::listRecord(rows));
-  return records;
+  return {rows, std::min(count.integer(0), filter.maxReturned.value_or(INT64_MAX))};
 }
 
 Answer queryEntries(Context& context, const XmlNode& request, const ListKind& kind,
@@ -359,17 +371,23 @@ Answer queryEntries(Context& context, const XmlNode& request, const ListKind& ki
   const QueryFilter filter = QueryFilter::read(request);
   std::optional<std::string> missing;
   const bool named = request.child("ListID") != nullptr || request.child("FullName") != nullptr;
-  std::vector<ListRecord> records =
-      named ? namedEntries(context, request, kind.table, kinds, missing)
-            : filteredEntries(context, request, kind.table, kinds, filter);
   const auto balances = balancesFor(context, kind.table);
-  std::vector<Field> rets;
-  rets.reserve(records.size());
-  for (const ListRecord& record : records) {
-    rets.push_back(
-        filter.included(listRet(context, kind, record, balances ? &*balances : nullptr)));
+  const auto add = [&](ListRecord record) {
+    const Ret ret = listRet(context, kind, std::move(record), balances ? &*balances : nullptr);
+    context.add(answer, ret.name, ret.fields, filter.includeRetElements);
+  };
+  if (named) {
+    for (ListRecord& record : namedEntries(context, request, kind.table, kinds, missing)) {
+      add(std::move(record));
+    }
+  } else {
+    const Selection selection = filteredEntries(context, request, kind.table, kinds, filter);
+    for (int64_t read = 0; selection.rows.step(); ++read) {
+      add(Store::listRecord(selection.rows));
+      if (read == 0) context.expect(static_cast<size_t>(selection.count - 1));
+    }
   }
-  finishQuery(answer, std::move(rets), missing);
+  finishQuery(answer, missing);
   return answer;
 }
 
@@ -435,7 +453,7 @@ Answer queryPayrollItemWages(Context&, const XmlNode& request) {
   for (const XmlNode& child : request.children) {
     if (!missing && (child.name == "ListID" || child.name == "FullName")) missing = child.text;
   }
-  finishQuery(answer, {}, missing);
+  finishQuery(answer, missing);
   return answer;
 }
 

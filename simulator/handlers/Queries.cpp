@@ -72,12 +72,10 @@ Field QueryFilter::included(Field ret) const {
   return ret;
 }
 
-void finishQuery(Answer& answer, std::vector<Field> records,
-                 const std::optional<std::string>& missing) {
-  answer.records = std::move(records);
+void finishQuery(Answer& answer, const std::optional<std::string>& missing) {
   if (missing) {
     answer.status = status::notFound(*missing);
-  } else if (answer.records.empty()) {
+  } else if (answer.count == 0) {
     answer.status = status::noMatch();
   }
 }

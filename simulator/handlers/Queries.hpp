@@ -50,10 +50,9 @@ struct QueryFilter {
   Field included(Field ret) const;
 };
 
-// Sets an answer's records and its status: 500 naming `missing` when a named entry was not
-// found, 1 when there are no records, OK otherwise.
-void finishQuery(Answer& answer, std::vector<Field> records,
-                 const std::optional<std::string>& missing);
+// Sets the status of an answer with its records: 500 naming `missing` when a named entry was
+// not found, 1 when there are no records, OK otherwise.
+void finishQuery(Answer& answer, const std::optional<std::string>& missing);
 
 // "%" and "_" escaped with "\" for a LIKE pattern.
 std::string likeEscaped(std::string_view text);

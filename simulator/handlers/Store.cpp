@@ -5,7 +5,8 @@
 
 #include <sqlite3.h>
 
-#include <cstdio>
+#include <algorithm>
+#include <charconv>
 #include <stdexcept>
 
 #include "simulator/CompanyFile.hpp"
@@ -73,8 +74,8 @@ constexpr int64_t kListIdBase = 0x80000000;
 }  // namespace
 
 Statement::Statement(sqlite3* db, std::string_view sql) : db_(db) {
-  const int result =
-      sqlite3_prepare_v2(db, sql.data(), static_cast<int>(sql.size()), &statement_, nullptr);
+  const int result = sqlite3_prepare_v3(db, sql.data(), static_cast<int>(sql.size()),
+                                        SQLITE_PREPARE_PERSISTENT, &statement_, nullptr);
   if (result != SQLITE_OK) failSqlite(db, result);
 }
 
@@ -184,19 +185,17 @@ void createTables(sqlite3* db) {
   }
 }
 
-std::string listIdText(int64_t id, int64_t created) {
+std::string txnIdText(int64_t id, int64_t created) {
+  // "%llX-%lld", written without the formatting machinery: a query writes one per record.
   char text[48];
-  std::snprintf(text, sizeof text, "%llX-%lld", static_cast<unsigned long long>(kListIdBase + id),
-                static_cast<long long>(created));
-  return text;
+  char* end = std::to_chars(text, text + 20, static_cast<unsigned long long>(id), 16).ptr;
+  std::transform(text, end, text, [](char c) { return c >= 'a' ? static_cast<char>(c - 32) : c; });
+  *end++ = '-';
+  end = std::to_chars(end, text + sizeof text, static_cast<long long>(created)).ptr;
+  return std::string(text, end);
 }
 
-std::string txnIdText(int64_t id, int64_t created) {
-  char text[48];
-  std::snprintf(text, sizeof text, "%llX-%lld", static_cast<unsigned long long>(id),
-                static_cast<long long>(created));
-  return text;
-}
+std::string listIdText(int64_t id, int64_t created) { return txnIdText(kListIdBase + id, created); }
 
 std::optional<std::pair<int64_t, int64_t>> parseListId(std::string_view text) {
   auto parsed = parseIdentifier(text);
@@ -209,18 +208,34 @@ std::optional<std::pair<int64_t, int64_t>> parseTxnId(std::string_view text) {
   return parseIdentifier(text);
 }
 
-Store::Store(sqlite3* db) : db_(db) {}
+StatementCache::StatementCache(sqlite3* db) : db_(db) {}
 
-Store::~Store() = default;
+StatementCache::~StatementCache() = default;
 
-Statement& Store::statement(const std::string& sql) {
-  auto& slot = statements_[sql];
-  if (!slot) slot = std::make_unique<Statement>(db_, sql);
-  return slot->reset();
+Statement& StatementCache::statement(const std::string& sql) {
+  auto found = statements_.find(sql);
+  // Kept only once prepared: SQL that fails to prepare leaves no entry behind.
+  if (found == statements_.end()) {
+    found = statements_.emplace(sql, std::make_unique<Statement>(db_, sql)).first;
+  }
+  return found->second->reset();
 }
 
-void Store::resetStatements() {
+void StatementCache::resetAll() {
   for (auto& [sql, statement] : statements_) statement->reset();
+}
+
+Store::Store(sqlite3* db, StatementCache* kept)
+    : own_(kept != nullptr ? nullptr : std::make_unique<StatementCache>(db)),
+      statements_(kept != nullptr ? *kept : *own_) {}
+
+Store::~Store() { statements_.resetAll(); }
+
+Statement& Store::statement(const std::string& sql) { return statements_.statement(sql); }
+
+void Store::endRequest() {
+  statements_.resetAll();
+  entries_.clear();
 }
 
 std::string_view Store::tableName(ListTable table) {
@@ -256,16 +271,20 @@ ListRecord Store::listRecord(const Statement& row) {
   record.created = row.integer(6);
   record.modified = row.integer(7);
   record.openingBalance = row.integer(8) * kCent;
-  record.fields = decodeFields(row.blob(9));
+  record.fields = decodeFields(row.blob(9), kRetRoom);
   return record;
 }
 
 std::optional<ListRecord> Store::list(ListTable table, int64_t id) {
+  const auto key = std::make_pair(table, id);
+  const auto found = entries_.find(key);
+  if (found != entries_.end()) return found->second;
   Statement& row = statement("SELECT " + std::string(kListColumns) + " FROM " +
                              std::string(tableName(table)) + " WHERE id = ?");
   row.bind(1, id);
-  if (!row.step()) return std::nullopt;
-  return listRecord(row);
+  std::optional<ListRecord> record;
+  if (row.step()) record = listRecord(row);
+  return entries_.emplace(key, std::move(record)).first->second;
 }
 
 int64_t Store::insertList(ListTable table, ListRecord& record) {
@@ -283,7 +302,8 @@ int64_t Store::insertList(ListTable table, ListRecord& record) {
       .bind(8, centsOrNull(record.openingBalance))
       .bindBlob(9, encodeFields(record.fields));
   insert.step();
-  record.id = sqlite3_last_insert_rowid(db_);
+  record.id = sqlite3_last_insert_rowid(db());
+  entries_.erase(std::make_pair(table, record.id));
   return record.id;
 }
 
@@ -292,6 +312,7 @@ void Store::updateFields(ListTable table, int64_t id, const std::vector<Field>& 
       statement("UPDATE " + std::string(tableName(table)) + " SET fields = ? WHERE id = ?");
   update.bindBlob(1, encodeFields(fields)).bind(2, id);
   update.step();
+  entries_.erase(std::make_pair(table, id));
 }
 
 std::optional<int64_t> Store::findByListId(ListTable table, std::string_view listId) {
@@ -324,7 +345,10 @@ const ListIdentity& Store::identity(ListTable table, int64_t id) {
       .first->second;
 }
 
-void Store::forgetLookups() { identities_.clear(); }
+void Store::forgetLookups() {
+  identities_.clear();
+  entries_.clear();
+}
 
 TxnRecord Store::txnRecord(const Statement& row) {
   TxnRecord record;

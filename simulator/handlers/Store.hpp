@@ -1,8 +1,8 @@
 // The lists and transactions of a company file in SQLite: one table per list (customers and
 // jobs, accounts, items of every kind, sales tax codes), one per transaction kind and one for
 // each kind's lines. Columns hold what queries select and sort on; everything else of a record
-// is one blob of encoded fields. A Store lives for one answered document and keeps its prepared
-// statements and the identities of the list entries it has looked up.
+// is one blob of encoded fields. A Store lives for one answered document and keeps the identities
+// of the list entries it has looked up; its prepared statements may outlive it.
 #ifndef DROQBXML_SIMULATOR_HANDLERS_STORE_HPP_
 #define DROQBXML_SIMULATOR_HANDLERS_STORE_HPP_
 
@@ -26,6 +26,7 @@ namespace droqbxml::simulator::handlers {
 // file (damaged, read-only, busy) and std::runtime_error otherwise.
 class Statement {
  public:
+  // Prepared as a statement that is kept and used again and again.
   Statement(sqlite3* db, std::string_view sql);
   ~Statement();
   Statement(const Statement&) = delete;
@@ -50,6 +51,27 @@ class Statement {
 
   sqlite3* db_;
   sqlite3_stmt* statement_ = nullptr;
+};
+
+// Prepared statements by their SQL text, each prepared once and rewound for every use. A session
+// keeps one for the life of its connection, so that its requests do not prepare the same statements
+// again.
+class StatementCache {
+ public:
+  explicit StatementCache(sqlite3* db);
+  ~StatementCache();
+  StatementCache(const StatementCache&) = delete;
+  StatementCache& operator=(const StatementCache&) = delete;
+
+  sqlite3* db() const noexcept { return db_; }
+  // The statement for `sql`, rewound with its bindings cleared.
+  Statement& statement(const std::string& sql);
+  // Rewinds every statement, so that none holds the file between requests.
+  void resetAll();
+
+ private:
+  sqlite3* db_;
+  std::unordered_map<std::string, std::unique_ptr<Statement>> statements_;
 };
 
 // Creates the tables and indexes of lists and transactions.
@@ -111,16 +133,20 @@ std::optional<std::pair<int64_t, int64_t>> parseTxnId(std::string_view text);
 
 class Store {
  public:
-  explicit Store(sqlite3* db);
+  // A store on `db` using the statements of `kept` (made for `db`, outliving the store), or
+  // without them statements of its own, prepared as they are first used. Leaving, it rewinds
+  // every statement it used.
+  explicit Store(sqlite3* db, StatementCache* kept = nullptr);
   ~Store();
   Store(const Store&) = delete;
   Store& operator=(const Store&) = delete;
 
-  sqlite3* db() const noexcept { return db_; }
+  sqlite3* db() const noexcept { return statements_.db(); }
   // The statement for `sql`, prepared on first use and reset for this one.
   Statement& statement(const std::string& sql);
-  // Rewinds every statement, so that none holds the file between requests.
-  void resetStatements();
+  // After a request: rewinds every statement, so that none holds the file, and forgets the
+  // entries read (another process may change them before the next request).
+  void endRequest();
 
   static std::string_view tableName(ListTable table);
   static std::string_view tableName(TxnTable table);
@@ -130,9 +156,12 @@ class Store {
   static constexpr std::string_view kListColumns =
       "id, kind, full_name, parent, sublevel, is_active, created, modified, opening_balance, "
       "fields";
-  // The record of the current row of a statement that selected kListColumns first.
+  // The record of the current row of a statement that selected kListColumns first, its fields
+  // with room for the kRetRoom that a Ret aggregate adds to them.
   static ListRecord listRecord(const Statement& row);
+  static constexpr size_t kRetRoom = 14;
 
+  // The entry, read from the file once per request (until the request changes it).
   std::optional<ListRecord> list(ListTable table, int64_t id);
   // Adds the entry under the next ListID number, which it sets in `record` and returns.
   int64_t insertList(ListTable table, ListRecord& record);
@@ -155,9 +184,10 @@ class Store {
   void loadLines(TxnTable table, TxnRecord& record);
 
  private:
-  sqlite3* db_;
-  std::unordered_map<std::string, std::unique_ptr<Statement>> statements_;
+  std::unique_ptr<StatementCache> own_;
+  StatementCache& statements_;
   std::map<std::pair<ListTable, int64_t>, ListIdentity> identities_;
+  std::map<std::pair<ListTable, int64_t>, std::optional<ListRecord>> entries_;  // this request's
 };
 
 }  // namespace droqbxml::simulator::handlers

@@ -269,11 +269,11 @@ void defaultField(std::vector<Field>& fields, Field field) {
 }
 
 // The Ret aggregate of a transaction, with its lines when `withLines`.
-Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool withLines) {
-  std::vector<Field> fields = txn.fields;
+Field txnRet(Context& context, const TxnKind& kind, TxnRecord txn, bool withLines) {
+  std::vector<Field> fields = std::move(txn.fields);
   fields.push_back(Field::value("TxnID", txnIdText(txn.id, txn.created)));
-  fields.push_back(Field::value("TimeCreated", formatDateTime(txn.created)));
-  fields.push_back(Field::value("TimeModified", formatDateTime(txn.modified)));
+  fields.push_back(Field::value("TimeCreated", context.dateTimeText(txn.created)));
+  fields.push_back(Field::value("TimeModified", context.dateTimeText(txn.modified)));
   fields.push_back(Field::value("EditSequence", std::to_string(txn.modified)));
   fields.push_back(Field::value("TxnNumber", std::to_string(txn.number)));
   fields.push_back(Field::reference("CustomerRef", ListTable::Customers, txn.customer));
@@ -297,26 +297,26 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
   if (withLines) {
     const std::string lineRet = named(kind, "LineRet");
     const std::string groupRet = named(kind, "LineGroupRet");
-    const auto lineField = [&](const TxnLine& line, const std::string& ret) {
-      std::vector<Field> lineFields = line.fields;
+    const auto lineField = [&](TxnLine& line, const std::string& ret) {
+      std::vector<Field> lineFields = std::move(line.fields);
       lineFields.push_back(Field::value("TxnLineID", txnIdText(line.id, txn.created)));
-      return Field::aggregate(ret, inSchemaOrder(ret, std::move(lineFields), context.version));
+      return Field::aggregate(ret, context.order.arrange(ret, std::move(lineFields)));
     };
     std::optional<Field> group;
     const auto closeGroup = [&] {
       if (group)
         fields.push_back(Field::aggregate(
-            groupRet, inSchemaOrder(groupRet, std::move(group->children), context.version)));
+            groupRet, context.order.arrange(groupRet, std::move(group->children))));
       group.reset();
     };
-    for (const TxnLine& line : txn.lines) {
+    for (TxnLine& line : txn.lines) {
       if (line.kind == LineKind::GroupMember && group) {
         group->children.push_back(lineField(line, lineRet));
         continue;
       }
       closeGroup();
       if (line.kind == LineKind::Group) {
-        group = Field::aggregate(groupRet, line.fields);
+        group = Field::aggregate(groupRet, std::move(line.fields));
         group->children.push_back(Field::value("TxnLineID", txnIdText(line.id, txn.created)));
       } else {
         fields.push_back(lineField(line, lineRet));
@@ -325,7 +325,7 @@ Field txnRet(Context& context, const TxnKind& kind, const TxnRecord& txn, bool w
     closeGroup();
   }
   const std::string ret = named(kind, "Ret");
-  return Field::aggregate(ret, inSchemaOrder(ret, std::move(fields), context.version));
+  return Field::aggregate(ret, context.order.arrange(ret, std::move(fields)));
 }
 
 Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
@@ -405,15 +405,17 @@ Answer addTxn(Context& context, const XmlNode& request, const TxnKind& kind) {
   setField(txn.fields, Field::value("SalesTaxPercentage", formatNumber(rate, NumberKind::Percent)));
   if (kind.invoice) txn.balance = txn.subtotal + txn.salesTax;
 
-  txn.id = context.company.nextCounter("TxnID");
-  for (TxnLine& line : lines.lines()) line.id = context.company.nextCounter("TxnID");
+  // The transaction's TxnID number, then its lines' in order.
+  txn.id = context.company.nextCounter("TxnID", 1 + static_cast<int64_t>(lines.lines().size()));
+  int64_t lineId = txn.id;
+  for (TxnLine& line : lines.lines()) line.id = ++lineId;
   txn.number = context.company.nextCounter("TxnNumber");
   txn.created = context.now;
   txn.modified = context.now;
   txn.lines = std::move(lines.lines());
   context.store.insertTxn(kind.table, txn);
   if (kind.invoice) sellFromStock(context, txn.lines);
-  answer.records.push_back(txnRet(context, kind, txn, true));
+  context.add(answer, txnRet(context, kind, std::move(txn), true));
   return answer;
 }
 
@@ -512,7 +514,6 @@ Answer queryTxns(Context& context, const XmlNode& request, const TxnKind& kind) 
                      request.child("RefNumberCaseSensitive") != nullptr;
   const std::vector<int64_t> ids = named ? namedTxns(context, request, kind, missing)
                                          : filteredTxns(context, request, kind, filter);
-  std::vector<Field> rets;
   for (const int64_t id : ids) {
     Statement& row =
         context.store.statement("SELECT " + std::string(Store::kTxnColumns) + " FROM " +
@@ -521,9 +522,9 @@ Answer queryTxns(Context& context, const XmlNode& request, const TxnKind& kind) 
     if (!row.step()) continue;
     TxnRecord txn = Store::txnRecord(row);
     if (withLines) context.store.loadLines(kind.table, txn);
-    rets.push_back(filter.included(txnRet(context, kind, txn, withLines)));
+    context.add(answer, filter.included(txnRet(context, kind, std::move(txn), withLines)));
   }
-  finishQuery(answer, std::move(rets), missing);
+  finishQuery(answer, missing);
   return answer;
 }
 

@@ -103,13 +103,18 @@ struct ContentAutomaton {
   std::vector<std::string_view> missingAtStart;
   std::vector<std::vector<std::string_view>> missingAfter;
 
+  // Every name the content mentions, in schema order, each once, and the same names sorted
+  // with their places in that order.
+  std::vector<std::string_view> order;
+  std::vector<std::pair<std::string_view, int>> ranks;
+
   std::string_view nameAt(int position) const;
   const Particle& particleAt(int position) const;
-  // Every name the content mentions, in schema order, each once.
-  std::vector<std::string_view> names() const;
+  // The place of `name` in `order`, or -1 when the content does not mention it.
+  int rankOf(std::string_view name) const;
 };
 
-// The automaton of aggregate `index` (built once, on first use, for all aggregates).
+// The automaton of aggregate `index` (built once, when first asked for).
 const ContentAutomaton& automatonOf(int index);
 
 }  // namespace droqbxml::simulator::internal

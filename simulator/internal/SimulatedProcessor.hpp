@@ -9,12 +9,14 @@
 #include <map>
 #include <memory>
 #include <set>
+#include <string>
 #include <vector>
 
 #include "droqbxml/connection/RequestProcessor.hpp"
 #include "droqbxml/runtime/Text.hpp"
 #include "simulator/CompanyFile.hpp"
 #include "simulator/RequestDocument.hpp"
+#include "simulator/handlers/Store.hpp"
 
 namespace droqbxml::simulator::internal {
 
@@ -66,6 +68,9 @@ class SimulatedProcessor final : public RequestProcessor {
   struct Session {
     Text path;  // as the session was begun with, or the open file's path for an empty one
     std::unique_ptr<CompanyFile> company;
+    // Prepared on the company file's connection for the session's requests; ends before it.
+    std::unique_ptr<handlers::StatementCache> statements;
+    std::string response;  // the last response document, whose room the next one reuses
   };
 
   void requireConnection() const;

@@ -333,6 +333,23 @@ class TreeChecker {
     return candidates;
   }
 
+  // named(next(state), name), without listing every position that may come next.
+  static std::vector<int> nextNamed(const ContentAutomaton& automaton,
+                                    const std::vector<int>& state, std::string_view name) {
+    if (state.empty()) return named(automaton, automaton.first, name);
+    std::vector<int> result;
+    for (int position : state) {
+      for (int following : automaton.follow[static_cast<std::size_t>(position)]) {
+        if (automaton.nameAt(following) == name &&
+            std::find(result.begin(), result.end(), following) == result.end()) {
+          result.push_back(following);
+        }
+      }
+    }
+    std::sort(result.begin(), result.end());
+    return result;
+  }
+
   static std::vector<int> named(const ContentAutomaton& automaton,
                                 const std::vector<int>& positions, std::string_view name) {
     std::vector<int> result;
@@ -350,8 +367,7 @@ class TreeChecker {
       if (problems_.full()) return;
       if (requests) request_ = static_cast<int>(&child - node.children.data());
       const Step step(path_, child.name);
-      const std::vector<int> candidates = next(automaton, state);
-      std::vector<int> matched = named(automaton, candidates, child.name);
+      std::vector<int> matched = nextNamed(automaton, state, child.name);
       if (!matched.empty()) {
         run = (!state.empty() && matched == state) ? run + 1 : 1;
         const Particle& particle = automaton.particleAt(matched.front());
@@ -375,8 +391,8 @@ class TreeChecker {
         report(child.line,
                tooMany(child.name, node.name, automaton.particleAt(state.front()).maxOccurs));
       } else {
-        report(child.line,
-               misplaced(automaton, candidates, state, elsewhere, child.name, node.name));
+        report(child.line, misplaced(automaton, next(automaton, state), state, elsewhere,
+                                     child.name, node.name));
       }
       state = std::move(elsewhere);
       run = 1;

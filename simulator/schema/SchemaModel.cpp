@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cstddef>
+#include <mutex>
 #include <string_view>
 #include <vector>
 
@@ -27,7 +28,12 @@ struct Fragment {
   std::vector<int> last;
 };
 
+// Adds the positions of `from` (which holds none twice) that `to` lacks, in their order.
 void addAll(std::vector<int>& to, const std::vector<int>& from) {
+  if (to.empty()) {  // the usual case, which a long repeated choice makes quadratic otherwise
+    to = from;
+    return;
+  }
   for (int position : from) {
     if (std::find(to.begin(), to.end(), position) == to.end()) to.push_back(position);
   }
@@ -52,6 +58,11 @@ class AutomatonBuilder {
     for (std::uint16_t particle : automaton_.positions) {
       automaton_.missingAfter.push_back(requiredAfter(particle));
     }
+    automaton_.order = namesOf(allPositions());
+    for (std::size_t rank = 0; rank < automaton_.order.size(); ++rank) {
+      automaton_.ranks.emplace_back(automaton_.order[rank], static_cast<int>(rank));
+    }
+    std::sort(automaton_.ranks.begin(), automaton_.ranks.end());
   }
 
  private:
@@ -109,6 +120,12 @@ class AutomatonBuilder {
     if (particle.minOccurs == 0) result.nullable = true;
     fragmentAt(index) = result;
     return result;
+  }
+
+  std::vector<int> allPositions() const {
+    std::vector<int> positions(automaton_.positions.size());
+    for (std::size_t i = 0; i < positions.size(); ++i) positions[i] = static_cast<int>(i);
+    return positions;
   }
 
   std::vector<std::string_view> namesOf(const std::vector<int>& positions) const {
@@ -179,24 +196,21 @@ const Particle& ContentAutomaton::particleAt(int position) const {
   return kParticles[positions[static_cast<std::size_t>(position)]];
 }
 
-std::vector<std::string_view> ContentAutomaton::names() const {
-  std::vector<std::string_view> result;
-  for (std::uint16_t index : positions) {
-    const std::string_view name = kParticles[index].name;
-    if (std::find(result.begin(), result.end(), name) == result.end()) result.push_back(name);
-  }
-  return result;
+int ContentAutomaton::rankOf(std::string_view name) const {
+  const auto found = std::lower_bound(ranks.begin(), ranks.end(), name,
+                                      [](const std::pair<std::string_view, int>& entry,
+                                         std::string_view wanted) { return entry.first < wanted; });
+  return found != ranks.end() && found->first == name ? found->second : -1;
 }
 
 const ContentAutomaton& automatonOf(int index) {
-  static const std::vector<ContentAutomaton> automata = [] {
-    std::vector<ContentAutomaton> all(kAggregates.size());
-    for (std::size_t i = 0; i < kAggregates.size(); ++i) {
-      AutomatonBuilder(all[i], kAggregates[i].rootParticle).build();
-    }
-    return all;
-  }();
-  return automata[static_cast<std::size_t>(index)];
+  // Each built when first asked for: a document touches a handful of the aggregates.
+  static std::vector<ContentAutomaton> automata(kAggregates.size());
+  static std::vector<std::once_flag> built(kAggregates.size());
+  const auto at = static_cast<std::size_t>(index);
+  std::call_once(built[at],
+                 [&] { AutomatonBuilder(automata[at], kAggregates[at].rootParticle).build(); });
+  return automata[at];
 }
 
 }  // namespace droqbxml::simulator::internal
@@ -206,7 +220,7 @@ namespace droqbxml::simulator {
 std::vector<std::string_view> schemaChildOrder(std::string_view aggregate) {
   const int index = internal::findAggregate(aggregate);
   if (index < 0) return {};
-  return internal::automatonOf(index).names();
+  return internal::automatonOf(index).order;
 }
 
 }  // namespace droqbxml::simulator
