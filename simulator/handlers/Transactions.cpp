@@ -34,6 +34,11 @@ std::string named(const TxnKind& kind, std::string_view suffix) {
   return std::string(kind.stem) + std::string(suffix);
 }
 
+// 3040 for a number of that kind written as QuickBooks writes it.
+Status refusedNumber(NumberKind kind, int64_t value, std::string_view field) {
+  return status::conversion(numberKindWord(kind), formatNumber(value, kind), field);
+}
+
 std::optional<int64_t> number(const std::vector<Field>& fields, std::string_view name) {
   const auto kind = numberKindOf(name);
   const std::string text = fieldText(fields, name);
@@ -176,6 +181,15 @@ class LineBuilder {
     if (amount) {
       if (discount && !given) amount = -std::abs(*amount);
       amount = roundToCents(*amount);
+      // An amount, or a total, past what QuickBooks holds cannot be converted: named by the
+      // value that took it there, the amount given or the rate it was worked out from.
+      const int64_t total =
+          std::max({std::abs(subtotal_), std::abs(sinceSubtotal_), std::abs(taxable_)});
+      if (std::abs(*amount) > kLargestAmount || total > kLargestAmount - std::abs(*amount)) {
+        if (given) throw Refusal(refusedNumber(NumberKind::Amount, *amount, "Amount"));
+        if (rate) throw Refusal(refusedNumber(NumberKind::Price, *rate, "Rate"));
+        throw Refusal(refusedNumber(NumberKind::Percent, *ratePercent, "RatePercent"));
+      }
       // A given amount without a rate sets the rate: per unit, or whole without a quantity.
       if (given && !rateGiven) {
         rate = quantity && *quantity != 0 ? divide(*amount, *quantity) : *amount;

@@ -2,6 +2,7 @@
 // come out to the cent as QuickBooks computes them), and the text and boolean forms.
 #include "simulator/handlers/Values.hpp"
 
+#include <algorithm>
 #include <array>
 #include <cstdlib>
 #include <utility>
@@ -131,17 +132,23 @@ std::string formatNumber(int64_t value, NumberKind kind) {
   return text;
 }
 
+// A wide result as a number, held just past the largest amount when it would not fit.
+int64_t narrowed(Wide value) {
+  constexpr Wide kPast = static_cast<Wide>(kLargestAmount) + kScale;
+  return static_cast<int64_t>(std::clamp(value, -kPast, kPast));
+}
+
 int64_t multiply(int64_t left, int64_t right) {
-  return static_cast<int64_t>(roundedQuotient(static_cast<Wide>(left) * right, kScale));
+  return narrowed(roundedQuotient(static_cast<Wide>(left) * right, kScale));
 }
 
 int64_t divide(int64_t value, int64_t divisor) {
   if (divisor == 0) return 0;
-  return static_cast<int64_t>(roundedQuotient(static_cast<Wide>(value) * kScale, divisor));
+  return narrowed(roundedQuotient(static_cast<Wide>(value) * kScale, divisor));
 }
 
 int64_t percentOf(int64_t value, int64_t percent) {
-  return static_cast<int64_t>(
+  return narrowed(
       roundedQuotient(static_cast<Wide>(value) * percent, static_cast<Wide>(kScale) * 100));
 }
 

@@ -30,7 +30,11 @@ std::optional<int64_t> parseNumber(std::string_view text, NumberKind kind);
 // `value` written as QuickBooks writes numbers of that kind.
 std::string formatNumber(int64_t value, NumberKind kind);
 
-// The product of two numbers, rounded half away from zero to five decimals.
+// The largest amount QuickBooks holds, 9999999999999.99 (an AMTTYPE's thirteen digits).
+inline constexpr int64_t kLargestAmount = 999999999999999 * kCent;
+
+// The product of two numbers, rounded half away from zero to five decimals. These three
+// give a value past kLargestAmount, not a wrapped one, when the result would not fit.
 int64_t multiply(int64_t left, int64_t right);
 // `value` divided by `divisor`, rounded half away from zero to five decimals.
 int64_t divide(int64_t value, int64_t divisor);
