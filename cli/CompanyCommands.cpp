@@ -48,8 +48,16 @@ int companyCreateCommand(Io io, const CompanyOptions& options) {
 }
 
 int companyShowCommand(Io io, const CompanyOptions& options) {
-  // Reading alone: a file this user may not change can still be shown.
-  return withCompanyFile(io, options.path, CompanyFile::Mode::ReadOnly, [&](CompanyFile& company) {
+  // Opened for changes where this user may make them, so that what a process killed while
+  // writing left behind is rolled back first, as any session would; otherwise for reading
+  // alone, so that a file this user may not change can still be shown.
+  auto mode = CompanyFile::Mode::ReadWrite;
+  try {
+    CompanyFile probe(fileOf(options.path), mode);
+  } catch (const CompanyFileError& error) {
+    if (error.kind() == CompanyFileError::Kind::ReadOnly) mode = CompanyFile::Mode::ReadOnly;
+  }
+  return withCompanyFile(io, options.path, mode, [&](CompanyFile& company) {
     io.out << company.summary();
     return kExitSuccess;
   });

@@ -5,6 +5,7 @@
 #include <optional>
 
 #include "droqbxml/records/internal/TagIndex.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 
 namespace droqbxml {
 
@@ -22,8 +23,9 @@ IndexedResponse::IndexedResponse(Text text)
 
 const Text& IndexedResponse::text() const noexcept { return state_->text; }
 
-const internal::TagIndex* IndexedResponse::index() const noexcept {
-  return state_->index ? &*state_->index : nullptr;
+int32_t IndexedResponse::read(const std::function<int32_t(const Text&)>& read) const {
+  const internal::SearchScope scope(state_->text, state_->index ? &*state_->index : nullptr);
+  return read(state_->text);
 }
 
 }  // namespace droqbxml

@@ -6,9 +6,10 @@
 #ifndef DROQBXML_RECORDS_INDEXEDRESPONSE_HPP_
 #define DROQBXML_RECORDS_INDEXEDRESPONSE_HPP_
 
+#include <cstdint>
+#include <functional>
 #include <memory>
 
-#include "droqbxml/records/internal/TextSearch.hpp"
 #include "droqbxml/runtime/Text.hpp"
 
 namespace droqbxml {
@@ -22,15 +23,10 @@ class IndexedResponse {
 
   // read(text()) with the searches over the text answered from the index; the records'
   // ParseRs overloads for an IndexedResponse are this.
-  template <class Read>
-  auto read(Read read) const {
-    const internal::SearchScope scope(text(), index());
-    return read(text());
-  }
+  int32_t read(const std::function<int32_t(const Text&)>& read) const;
 
  private:
   struct State;
-  const internal::TagIndex* index() const noexcept;
 
   std::shared_ptr<const State> state_;
 };
