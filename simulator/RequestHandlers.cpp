@@ -96,8 +96,8 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings) {
   handlers::addStandardLists(store, settings, handlers::currentTime());
 }
 
-void answerRequests(CompanyFile& company, const RequestDocument& document,
-                    handlers::StatementCache* kept, std::string& response) {
+void handlers::answerRequests(CompanyFile& company, const RequestDocument& document,
+                              StatementCache* kept, std::string& response) {
   const XmlNode* messages = document.root.child("QBXMLMsgsRq");
   if (messages == nullptr) refuseDocument();
   const std::string onError = messages->attribute("onError").value_or("stopOnError");
@@ -139,10 +139,9 @@ void answerRequests(CompanyFile& company, const RequestDocument& document,
   response += handlers::kResponseEnd;
 }
 
-std::string answerRequests(CompanyFile& company, const RequestDocument& document,
-                           handlers::StatementCache* kept) {
+std::string answerRequests(CompanyFile& company, const RequestDocument& document) {
   std::string response;
-  answerRequests(company, document, kept, response);
+  handlers::answerRequests(company, document, nullptr, response);
   return response;
 }
 

@@ -15,7 +15,7 @@ namespace droqbxml::simulator {
 
 namespace handlers {
 class StatementCache;
-}
+}  // namespace handlers
 
 // Creates the tables of lists and transactions and the data a new QuickBooks company
 // holds (chart of accounts, sales tax codes, the sales tax item when sales tax is on).
@@ -31,14 +31,16 @@ void initializeCompanyData(sqlite3* db, const CompanySettings& settings);
 // default dates) come from the present moment in local time, or, when the environment
 // variable DROQBXML_SIMULATOR_NOW holds a date and time such as "2009-03-02T10:40:23-05:00",
 // from that moment with that offset (for tests and reproducible demonstrations).
-// `kept`: statements prepared on `company`'s connection and kept between documents (a
-// session's); without them the document's statements are prepared for it alone.
-std::string answerRequests(CompanyFile& company, const RequestDocument& document,
-                           handlers::StatementCache* kept = nullptr);
-// The same, writing the response document into `response` in place of what it held: a session
-// passes the same text each time, so that its room serves every response.
-void answerRequests(CompanyFile& company, const RequestDocument& document,
-                    handlers::StatementCache* kept, std::string& response);
+std::string answerRequests(CompanyFile& company, const RequestDocument& document);
+
+namespace handlers {
+// answerRequests for a session: `kept` holds statements prepared on `company`'s connection and
+// kept between documents (without them the document's statements are prepared for it alone),
+// and the response document is written into `response` in place of what it held, so that one
+// text's room serves every response.
+void answerRequests(CompanyFile& company, const RequestDocument& document, StatementCache* kept,
+                    std::string& response);
+}  // namespace handlers
 
 }  // namespace droqbxml::simulator
 

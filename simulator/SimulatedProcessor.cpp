@@ -251,7 +251,8 @@ Text SimulatedProcessor::ProcessRequest(const Text& ticket, const Text& request)
   // readable; anything else is its parse error.
   if (!read.document) raise(Failure::Parse);
   return onCompanyFile([&] {
-    answerRequests(*session.company, *read.document, session.statements.get(), session.response);
+    handlers::answerRequests(*session.company, *read.document, session.statements.get(),
+                             session.response);
     return fromUtf8(session.response);
   });
 }

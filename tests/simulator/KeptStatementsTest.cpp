@@ -106,8 +106,11 @@ std::string contents(sqlite3* db) {
 // The response, or the error the document was refused with.
 std::string answered(CompanyFile& company, const RequestDocument& document,
                      handlers::StatementCache* kept) {
+  std::string response = "what a session answered before";
   try {
-    return answerRequests(company, document, kept);
+    if (kept == nullptr) return answerRequests(company, document);
+    handlers::answerRequests(company, document, kept, response);
+    return response;
   } catch (const std::exception& error) {
     return std::string("refused: ") + error.what();
   }
