@@ -8,7 +8,7 @@
   one (an invoice has all its lines or is not there).
 - Together: two, then four adders on one file at once lose nothing.
 - Kept waiting: an adder whose file another process holds locked gets QuickBooks' "could
-  not open the company data file" (0x80040403) once its wait runs out, and what it added
+  not open the company data file" (0x80040403) once its wait runs out, and what was added
   before stays.
 
 usage: company_file_survives.py ADDER DROQBXML
@@ -159,20 +159,22 @@ def together(adder, droqbxml, folder, count):
 
 def kept_waiting(adder, droqbxml, folder):
     company = create(droqbxml, folder, "locked.qbw")
-    run = Adder(adder, company, "W", 0, ADDS)
-    run.wait_for(3)
+    before = Adder(adder, company, "W", 0, 3)
+    if before.finish() != 0:
+        fail(f"adds before the lock: {before.other}")
     holder = sqlite3.connect(company, timeout=60, isolation_level=None)
     holder.execute("BEGIN EXCLUSIVE")
+    run = Adder(adder, company, "W", 3, 3)
     status = run.finish()
     holder.execute("ROLLBACK")
     holder.close()
     expected = "error 0x80040403 Could not open the specified QuickBooks company data file."
-    if status != 3 or run.other != [expected]:
-        fail(f"an adder kept waiting: exit {status}, {run.other}")
+    if status != 3 or run.answered or run.other != [expected]:
+        fail(f"an adder kept waiting: exit {status}, {run.answered}, {run.other}")
     held = set(contents(company, "W"))
-    if held != set(run.answered):
-        fail(f"an adder kept waiting: answered {run.answered}, the file holds {sorted(held)}")
-    print(f"kept waiting: 0x80040403 after {len(run.answered)} adds, which stay", flush=True)
+    if held != {0, 1, 2}:
+        fail(f"after an adder was kept waiting the file holds {sorted(held)}")
+    print("kept waiting: 0x80040403, and the adds made before stay", flush=True)
 
 
 def main():
