@@ -221,19 +221,19 @@ const ClassInfo& DroTxnLineGroupCol<Kind>::typeInfo() {
 template <TxnKind Kind>
 void readGroups(DroTxnLineGroupCol<Kind>& groups, const Text& Value, int32_t& StartPoint,
                 int32_t& EndPoint) {
-  const TxnKindSpec& spec = kTxnKinds[static_cast<size_t>(Kind)];
+  const TxnKindSpec& kind = kTxnKinds[static_cast<size_t>(Kind)];
   const auto parse = [&](DroTxnLineGroup<Kind>& group) {
     group.ParseRs(Value, StartPoint, EndPoint);
   };
   for (;;) {
-    const int32_t groupAt = findInResponse(EndPoint, Value, spec.groupTag);
+    const int32_t groupAt = findInResponse(EndPoint, Value, kind.groupTag);
     if (groupAt == 0) return;
     const int32_t before = EndPoint;
     // The key read raises as every read does; the rest of the round swallows its errors.
-    const Text key = peekElement(Value, u"FullName", StartPoint, EndPoint, spec.groupKeyRequired,
-                                 spec.groupContext);
+    const Text key = peekElement(Value, u"FullName", StartPoint, EndPoint, kind.groupKeyRequired,
+                                 kind.groupContext);
     parseKeyed(groups, key, Fresh::Suppressed, parse);
-    moveOn(EndPoint, before, groupAt, spec.groupTag);
+    moveOn(EndPoint, before, groupAt, kind.groupTag);
   }
 }
 
