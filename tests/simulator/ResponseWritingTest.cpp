@@ -22,36 +22,32 @@ namespace droqbxml::simulator::handlers {
 namespace {
 
 TEST(ResponseWritingTest, TimesAndIdentifiersAsPrintfWritesThem) {
-  std::mt19937_64 random(7);
-  test::ScopedVariable now("DROQBXML_SIMULATOR_NOW");
   // From before the year 0 to past 9999 (written as printf writes them there too), with
   // offsets up to the largest the variable can give.
+  std::mt19937_64 random(7);
+  test::ScopedVariable now("DROQBXML_SIMULATOR_NOW");
   std::uniform_int_distribution<int64_t> times(-62200000000, 320000000000);
-  for (int round = 0; round < 3000; ++round) {
+  const std::vector<int64_t> edges{0, -1, LLONG_MIN, LLONG_MAX, 253402300799};
+  for (size_t round = 0; round < 3000; ++round) {
     const int hours = static_cast<int>(random() % 100);
-    const int minutes = static_cast<int>(random() % 100);
+    const int minutes = static_cast<int>(random() % 100);  // past 59 too: the variable takes them
+    const int offset = hours * 3600 + minutes * 60;
     const char sign = random() % 2 ? '-' : '+';
-    char fixed[40];
-    std::snprintf(fixed, sizeof fixed, "2009-03-02T10:40:23%c%02d:%02d", sign, hours, minutes);
-    now.set(fixed);
-    const int offset = (sign == '-' ? -1 : 1) * (hours * 3600 + minutes * 60);
-    const int64_t time =
-        round < 3 ? std::vector<int64_t>{0, -1, 253402300799}[round] : times(random);
-    const std::time_t local = time + offset;
+    char text[48];
+    std::snprintf(text, sizeof text, "2009-03-02T10:40:23%c%02d:%02d", sign, hours, minutes);
+    now.set(text);
+    const int64_t time = round < 2 ? edges[round] : round == 2 ? edges[4] : times(random);
+    const std::time_t local = time + (sign == '-' ? -offset : offset);
     std::tm civil{};
     ASSERT_NE(gmtime_r(&local, &civil), nullptr);
-    char expected[48];
-    std::snprintf(expected, sizeof expected, "%04d-%02d-%02dT%02d:%02d:%02d%c%02d:%02d",
+    std::snprintf(text, sizeof text, "%04d-%02d-%02dT%02d:%02d:%02d%c%02d:%02d",
                   civil.tm_year + 1900, civil.tm_mon + 1, civil.tm_mday, civil.tm_hour,
-                  civil.tm_min, civil.tm_sec, sign, (hours * 3600 + minutes * 60) / 3600,
-                  minutes % 60);
-    ASSERT_EQ(formatDateTime(time), expected) << fixed << " " << time;
-
-    const int64_t id = round < 4 ? std::vector<int64_t>{0, -1, LLONG_MIN, LLONG_MAX}[round]
-                                 : static_cast<int64_t>(random() >> (random() % 64));
-    std::snprintf(expected, sizeof expected, "%llX-%lld", static_cast<unsigned long long>(id),
+                  civil.tm_min, civil.tm_sec, sign, offset / 3600, offset / 60 % 60);
+    ASSERT_EQ(formatDateTime(time), text) << time;
+    const int64_t id = round < 4 ? edges[round] : static_cast<int64_t>(random() >> random() % 64);
+    std::snprintf(text, sizeof text, "%llX-%lld", static_cast<unsigned long long>(id),
                   static_cast<long long>(time));
-    ASSERT_EQ(txnIdText(id, time), expected);
+    ASSERT_EQ(txnIdText(id, time), text);
   }
 }
 
