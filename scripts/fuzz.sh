@@ -9,6 +9,7 @@
 #
 #   scripts/fuzz.sh [SECONDS] [TARGET...]      SECONDS defaults to 60; TARGET to all
 #   FUZZ_RUNS=10000000 scripts/fuzz.sh 7200     stop each after ten million executions
+#   FUZZ_ARGS="-max_len=1024" scripts/fuzz.sh   more libFuzzer options for every target
 set -euo pipefail
 cd "$(dirname "$0")/.."
 root=$(pwd)
@@ -57,7 +58,7 @@ run_target() {
     [ "$left" -gt 0 ] || break
     status=0
     timeout $((left + 300)) nice -n 19 "$fuzzer" -max_total_time="$left" -runs="$runs" \
-      -timeout=1 -rss_limit_mb=2048 -print_final_stats=1 -dict="$root/fuzz/qbxml.dict" \
+      ${FUZZ_ARGS:-} -timeout=1 -rss_limit_mb=2048 -print_final_stats=1 -dict="$root/fuzz/qbxml.dict" \
       -artifact_prefix="$artifacts/" "$corpus" "$seeds" >"$segment" 2>&1 || status=$?
     cat "$segment" >>"$log"
     local done_runs
