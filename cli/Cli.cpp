@@ -6,6 +6,7 @@
 #include <array>
 #include <chrono>
 #include <cstdio>
+#include <cstdlib>
 #include <exception>
 #include <string>
 #include <utility>
@@ -17,6 +18,7 @@
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Utf.hpp"
 #include "simulator/Simulator.hpp"
+#include "webconnector/WebConnector.hpp"
 
 namespace droqbxml::cli {
 namespace {
@@ -104,9 +106,23 @@ const CLI::Validator kQbxmlDate(
     },
     "yyyy-mm-dd", "qbXML date");
 
+// The relay port of a Web Connector service on this machine: DROQBXML_WEBCONNECTOR_PORT, or
+// the service's default.
+int webConnectorPort() {
+  const char* port = std::getenv("DROQBXML_WEBCONNECTOR_PORT");
+  return port != nullptr && std::atoi(port) > 0 ? std::atoi(port) : 7372;
+}
+
 // The stand-in answers for QuickBooks when asked to through the environment, and wherever
-// the platform has no request processor of its own.
-void selectDefaultProcessor() {
+// the platform has no request processor of its own. "DroQbXml.WebConnector" reaches the
+// Web Connector service running on this machine, unless the host installed one itself.
+void selectDefaultProcessor(const ConnectionOptions& connection) {
+  if (!registeredRequestProcessor(webconnector::kWebConnectorProgId)) {
+    const int port = webConnectorPort();
+    const std::optional<int> wait = connection.wait;
+    registerRequestProcessor(webconnector::kWebConnectorProgId,
+                             [port, wait] { return relayClient(port, wait); });
+  }
   if (simulator::installIfRequested()) return;
   if (registeredRequestProcessor(kRequestProcessorProgId)) return;
   try {
@@ -172,6 +188,10 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
   app.add_option("--company", connection.company,
                  "Company file to open; \"C:\\...\" paths map as the component maps them "
                  "(demo: created when missing and kept; default a temporary one)");
+  app.add_option("--wait", connection.wait,
+                 "Seconds the Web Connector processor waits for QuickBooks (session and "
+                 "each request)")
+      ->check(CLI::PositiveNumber);
   app.add_option("--trace", connection.traceFile,
                  "Append the component's trace of each exchange to this file");
 
@@ -253,6 +273,31 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
       "relay", "Serve the request processor to Windows programs under Wine (see com/relay)");
   relay->add_option("--port", port, "Loopback port to listen on")->capture_default_str();
 
+  std::string wcConfig;
+  auto* web = app.add_subcommand("webconnector",
+                                 "Serve Intuit's Web Connector, and what setting it up needs");
+  web->require_subcommand(1);
+  auto* serve = web->add_subcommand(
+      "serve", "Run the Web Connector service in the foreground until SIGTERM (log on stderr)");
+  serve->add_option("--config", wcConfig, "Service configuration file")->required();
+  PlayOptions play;
+  auto* playCommand = web->add_subcommand(
+      "play", "Play the Web Connector against a service, relaying to the embedded stand-in");
+  playCommand->add_option("--url", play.url, "The service's AppURL")->required();
+  playCommand->add_option("--user", play.user, "Web Connector user name")->required();
+  playCommand->add_option("--password-file", play.passwordFile,
+                          "File whose first line is the password (default: standard input)");
+  playCommand->add_option("--company", play.companyFile,
+                          "Company file of the stand-in to open when the service names none");
+  playCommand->add_option("--ca", play.caFile, "Certificates to trust (PEM)");
+  playCommand->add_flag("--insecure", play.insecure, "Do not check the service's certificate");
+  playCommand->add_option("--runs", play.runs, "Runs to make (0: until stopped)")
+      ->capture_default_str();
+  playCommand->add_option("--every", play.every, "Seconds between runs")->capture_default_str();
+  playCommand
+      ->add_option("--noop-pause", play.noOpPause, "Seconds to pause when the service answers NoOp")
+      ->capture_default_str();
+
   try {
     // A first word that names no command would otherwise be reported as a missing one.
     const auto named = [&](const char* word) {
@@ -280,7 +325,7 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
   const auto output = format == 1 ? OutputFormat::Json : OutputFormat::Xml;
 
   const Io io{in, out, err};
-  selectDefaultProcessor();
+  selectDefaultProcessor(connection);
   try {
     if (send->parsed()) return sendCommand(io, file, connection, output);
     if (querySub->parsed()) return queryCommand(io, query, connection, output);
@@ -298,6 +343,8 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
     if (paths->parsed()) return pathsCommand(io);
     if (demo->parsed()) return demoCommand(io, connection, verbose);
     if (relay->parsed()) return relayCommand(io, port, connection);
+    if (serve->parsed()) return webConnectorServeCommand(io, wcConfig);
+    if (playCommand->parsed()) return webConnectorPlayCommand(io, play);
   } catch (const ComError& error) {
     err << "droqbxml: " << error.what() << " (error " << error.number() << ", "
         << toUtf8(error.source()) << ")\n";

@@ -30,6 +30,7 @@ struct ConnectionOptions {
   std::optional<std::string> appId;
   std::optional<std::string> processor;
   std::optional<std::string> traceFile;  // the component's trace output, when asked for
+  std::optional<int> wait;               // seconds a remote processor waits for QuickBooks
 };
 
 enum class OutputFormat { Xml, Json };
@@ -147,6 +148,31 @@ int lintCommand(Io io, const std::string& file);
 // Serves request processor calls relayed from the Windows side on 127.0.0.1:port; runs until
 // stopped.
 int relayCommand(Io io, int port, const ConnectionOptions& connection);
+// The relay's pieces, shared with the Web Connector service: a listener on 127.0.0.1:port
+// (-1 when it cannot listen), the loop answering each connection with a processor from
+// `factory` (it returns once the listener is shut down), and a host's processor whose calls
+// go to a relay on `port`, with the waits it asks the service for.
+int listenOnLoopback(int port);
+void acceptRelayCalls(int listener, RequestProcessorFactory factory);
+std::shared_ptr<RequestProcessor> relayClient(int port, std::optional<int> waitSeconds);
+
+// Runs the Web Connector service of the configuration file until SIGTERM or SIGINT, with
+// hosts reaching it through the relay port; events go to the error stream.
+int webConnectorServeCommand(Io io, const std::string& configFile);
+struct PlayOptions {
+  std::string url;
+  std::string user;
+  std::optional<std::string> passwordFile;  // otherwise the first line of the input stream
+  std::string companyFile;
+  std::optional<std::string> caFile;
+  bool insecure = false;
+  int runs = 1;       // 0: until stopped
+  int every = 60;     // seconds between runs
+  int noOpPause = 5;  // seconds after getLastError "NoOp"
+};
+// Plays Intuit's Web Connector against a service, relaying each request to the embedded
+// stand-in; a line per run on the output stream.
+int webConnectorPlayCommand(Io io, const PlayOptions& options);
 int demoCommand(Io io, const ConnectionOptions& connection, bool verbose = false);
 
 // Reads a request document from a file, or from the input stream for "-"; reports an

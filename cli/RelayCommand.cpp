@@ -8,13 +8,20 @@
 // by NUL: a call is the member's name and its arguments; the answer is "OK" and the result,
 // or "ERR", the error number and its description. Windows paths on drive Z: (Wine's view of
 // the Unix root) are handed to the processor as Unix paths, and given back as Z: paths.
+//
+// The same messages carry a Linux host's calls to a Web Connector service started by
+// `droqbxml webconnector serve` (relayClient below), with one more call, "SetWaits", that
+// sets how long the service's processor waits for the Web Connector.
 #include <arpa/inet.h>
 #include <netinet/in.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
 #include <array>
+#include <cerrno>
+#include <chrono>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
@@ -23,6 +30,7 @@
 #include "cli/Commands.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Utf.hpp"
+#include "webconnector/WebConnector.hpp"
 
 namespace droqbxml::cli {
 namespace {
@@ -111,6 +119,10 @@ std::vector<std::string> answer(RequestProcessor& processor, const std::vector<s
       result = asciiText(std::to_string(processor.MajorVersion()));
     } else if (name == "MinorVersion") {
       result = asciiText(std::to_string(processor.MinorVersion()));
+    } else if (auto* waiting = dynamic_cast<webconnector::WaitingProcessor*>(&processor);
+               waiting != nullptr && name == "SetWaits") {
+      waiting->setWaits({std::chrono::milliseconds(std::stoll("0" + call.at(1))),
+                         std::chrono::milliseconds(std::stoll("0" + call.at(2)))});
     } else {
       return {"ERR", std::to_string(RuntimeError::kMemberNotSupported),
               "Object doesn't support this property or method"};
@@ -123,15 +135,13 @@ std::vector<std::string> answer(RequestProcessor& processor, const std::vector<s
   }
 }
 
-void serve(int client) {
+void serve(int client, const RequestProcessorFactory& factory) {
   std::shared_ptr<RequestProcessor> processor;
   std::vector<std::string> call;
   while (readMessage(client, call)) {
     std::vector<std::string> reply;
     try {
-      if (!processor) {
-        processor = createRequestProcessor(kRequestProcessorProgId);
-      }
+      if (!processor) processor = factory();
       reply = answer(*processor, call);
     } catch (const ComError& error) {
       reply = {"ERR", std::to_string(error.number()), toUtf8(error.description())};
@@ -141,29 +151,120 @@ void serve(int client) {
   ::close(client);
 }
 
-}  // namespace
-
-int relayCommand(Io io, int port, const ConnectionOptions& connection) {
-  const int listener = ::socket(AF_INET, SOCK_STREAM, 0);
-  const int yes = 1;
-  ::setsockopt(listener, SOL_SOCKET, SO_REUSEADDR, &yes, sizeof yes);
+sockaddr_in loopback(int port) {
   sockaddr_in address{};
   address.sin_family = AF_INET;
   address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
   address.sin_port = htons(static_cast<uint16_t>(port));
+  return address;
+}
+
+// A host's request processor whose calls go to a relay on 127.0.0.1:port.
+class RelayClient final : public RequestProcessor {
+ public:
+  RelayClient(int port, std::optional<int> waitSeconds) : port_(port), wait_(waitSeconds) {}
+  ~RelayClient() override {
+    if (socket_ >= 0) ::close(socket_);
+  }
+
+  void OpenConnection(const Text& appID, const Text& appName) override {
+    if (wait_) {
+      const std::string ms = std::to_string(*wait_ * 1000LL);
+      call({"SetWaits", ms, ms});
+    }
+    call({"OpenConnection", toUtf8(appID), toUtf8(appName)});
+  }
+  Text BeginSession(const Text& qbFile, QBFileMode mode) override {
+    return call({"BeginSession", toUtf8(qbFile), std::to_string(mode)});
+  }
+  Text ProcessRequest(const Text& ticket, const Text& request) override {
+    return call({"ProcessRequest", toUtf8(ticket), toUtf8(request)});
+  }
+  void EndSession(const Text& ticket) override { call({"EndSession", toUtf8(ticket)}); }
+  void CloseConnection() override { call({"CloseConnection"}); }
+  Text GetCurrentCompanyFileName(const Text& ticket) override {
+    return call({"GetCurrentCompanyFileName", toUtf8(ticket)});
+  }
+  int16_t MajorVersion() override {
+    return static_cast<int16_t>(std::stoi("0" + toUtf8(call({"MajorVersion"}))));
+  }
+  int16_t MinorVersion() override {
+    return static_cast<int16_t>(std::stoi("0" + toUtf8(call({"MinorVersion"}))));
+  }
+
+ private:
+  Text call(const std::vector<std::string>& fields) {
+    if (socket_ < 0) {
+      socket_ = ::socket(AF_INET, SOCK_STREAM, 0);
+      const sockaddr_in address = loopback(port_);
+      if (socket_ < 0 ||
+          ::connect(socket_, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0) {
+        if (socket_ >= 0) ::close(socket_);
+        socket_ = -1;
+        raiseError(webconnector::Hresult::kCouldNotStart, Text(webconnector::kWebConnectorProgId),
+                   asciiText("Could not start QuickBooks: no DroQbXml Web Connector service "
+                             "answers on 127.0.0.1:" +
+                             std::to_string(port_) + " (droqbxml webconnector serve)."));
+      }
+    }
+    std::vector<std::string> reply;
+    if (!writeMessage(socket_, fields) || !readMessage(socket_, reply) || reply.empty()) {
+      ::close(socket_);
+      socket_ = -1;
+      raiseError(webconnector::Hresult::kUnexpected, Text(webconnector::kWebConnectorProgId),
+                 u"The DroQbXml Web Connector service closed the connection.");
+    }
+    if (reply[0] == "OK") return reply.size() > 1 ? fromUtf8(reply[1]) : Text();
+    raiseError(static_cast<int32_t>(std::stoll("0" + (reply.size() > 1 ? reply[1] : ""))),
+               Text(webconnector::kWebConnectorProgId), fromUtf8(reply.size() > 2 ? reply[2] : ""));
+  }
+
+  int port_;
+  std::optional<int> wait_;
+  int socket_ = -1;
+};
+
+}  // namespace
+
+int listenOnLoopback(int port) {
+  const int listener = ::socket(AF_INET, SOCK_STREAM, 0);
+  const int yes = 1;
+  ::setsockopt(listener, SOL_SOCKET, SO_REUSEADDR, &yes, sizeof yes);
+  const sockaddr_in address = loopback(port);
   if (listener < 0 ||
-      ::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address) != 0 ||
+      ::bind(listener, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0 ||
       ::listen(listener, 8) != 0) {
+    if (listener >= 0) ::close(listener);
+    return -1;
+  }
+  return listener;
+}
+
+void acceptRelayCalls(int listener, RequestProcessorFactory factory) {
+  for (;;) {
+    const int client = ::accept(listener, nullptr, nullptr);
+    if (client < 0) {
+      if (errno == EINTR || errno == ECONNABORTED) continue;
+      return;
+    }
+    std::thread(serve, client, factory).detach();
+  }
+}
+
+std::shared_ptr<RequestProcessor> relayClient(int port, std::optional<int> waitSeconds) {
+  return std::make_shared<RelayClient>(port, waitSeconds);
+}
+
+int relayCommand(Io io, int port, const ConnectionOptions& connection) {
+  const int listener = listenOnLoopback(port);
+  if (listener < 0) {
     io.err << "droqbxml: cannot listen on 127.0.0.1:" << port << '\n';
     return kExitConnection;
   }
   io.out << "relaying request processor calls on 127.0.0.1:" << port << std::endl;
   const ProcessorOverride override(connection.processor);
-  for (;;) {
-    const int client = ::accept(listener, nullptr, nullptr);
-    if (client < 0) continue;
-    std::thread(serve, client).detach();
-  }
+  acceptRelayCalls(listener, [] { return createRequestProcessor(kRequestProcessorProgId); });
+  return kExitConnection;
 }
 
 }  // namespace droqbxml::cli

@@ -46,7 +46,7 @@ struct ServiceConfig {
   std::string path = "/qbwc";
   uint16_t relayPort = 7372;
   std::chrono::seconds ticketLifetime{30 * 60};
-  std::chrono::seconds hold{10};
+  std::chrono::milliseconds hold{std::chrono::seconds(10)};
   size_t maxBodyBytes = 10 * 1024 * 1024;
   std::string appName = "DroQbXml";
   std::vector<ServiceUser> users;

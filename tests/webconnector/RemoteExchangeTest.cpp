@@ -1,0 +1,273 @@
+// The whole remote exchange over real HTTP on loopback: hosts use the component through
+// "DroQbXml.WebConnector", a player plays Intuit's Web Connector and relays each request
+// into the embedded stand-in, and misbehaving clients get the protocol's answers.
+#include <arpa/inet.h>
+#include <gtest/gtest.h>
+#include <httplib.h>
+#include <spawn.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <csignal>
+#include <future>
+#include <optional>
+#include <sstream>
+#include <thread>
+
+#include "cli/Cli.hpp"
+#include "cli/Commands.hpp"
+#include "droqbxml/runtime/ComError.hpp"
+#include "droqbxml/runtime/Utf.hpp"
+#include "simulator/CompanyFile.hpp"
+#include "simulator/Simulator.hpp"
+#include "tests/TestSupport.hpp"
+#include "webconnector/Player.hpp"
+#include "webconnector/WebConnector.hpp"
+
+extern char** environ;
+
+namespace droqbxml::webconnector {
+namespace {
+
+using namespace std::chrono_literals;
+using Params = std::vector<std::pair<std::string, std::string>>;
+
+constexpr const char* kQuery =
+    "<?xml version=\"1.0\" ?>\r\n<?qbxml version=\"13.0\"?>\r\n<QBXML><QBXMLMsgsRq "
+    "onError=\"stopOnError\"><CustomerQueryRq requestID=\"1\"><FullName>Nobody</FullName>"
+    "</CustomerQueryRq></QBXMLMsgsRq></QBXML>";
+
+class RemoteExchangeTest : public ::testing::Test {
+ protected:
+  RemoteExchangeTest() {
+    // alice's Web Connector serves her company file, bob's whichever file a host asks for.
+    simulator::CompanyFile::create(company("alice"), {"Alice", true, {cli::componentAppName()}});
+    config_.users.push_back({"alice", hashPassword("alice", HashCost::Cheap), company("alice")});
+    config_.users.push_back({"bob", hashPassword("bob", HashCost::Cheap), ""});
+    config_.port = 0;
+    config_.hold = 300ms;
+    service_.emplace(config_);
+    service_->start();
+    install(*service_, {3s, 3s});
+  }
+  ~RemoteExchangeTest() override { unregisterRequestProcessor(kWebConnectorProgId); }
+
+  PlayerOptions options(const std::string& user, const std::string& password) {
+    PlayerOptions options;
+    options.url = service_->url();
+    options.companyFile = company("alice");
+    options.appName = cli::componentAppName();
+    options.user = user;
+    options.password = password;
+    options.noOpPause = 10ms;
+    return options;
+  }
+  // A Web Connector for `user` that runs every few milliseconds until the test ends.
+  void keepPlaying(const std::string& user) {
+    players_.emplace_back([this, user] {
+      Player player(options(user, user), simulator::createProcessor());
+      while (!stop_) {
+        try {
+          player.run();
+        } catch (const PlayerError&) {  // the service is gone: try again at the next run
+        }
+        std::this_thread::sleep_for(5ms);
+      }
+    });
+  }
+  // The same in a process of its own, as `droqbxml webconnector play`: the stand-in opens
+  // one company file per process, as QuickBooks does per machine.
+  void keepPlayingElsewhere(const std::string& user) {
+    const std::string passwordFile = drive_.path(user + ".password").string();
+    test::writeFile(passwordFile, user + "\n");
+    const std::string url = service_->url();
+    std::vector<std::string> args{DROQBXML_COMMAND,
+                                  "webconnector",
+                                  "play",
+                                  "--url",
+                                  url,
+                                  "--user",
+                                  user,
+                                  "--password-file",
+                                  passwordFile,
+                                  "--runs",
+                                  "0",
+                                  "--every",
+                                  "0",
+                                  "--noop-pause",
+                                  "0"};
+    std::vector<char*> argv;
+    for (auto& arg : args) argv.push_back(arg.data());
+    argv.push_back(nullptr);
+    pid_t child = 0;
+    ASSERT_EQ(::posix_spawn(&child, argv[0], nullptr, nullptr, argv.data(), environ), 0);
+    children_.push_back(child);
+  }
+  std::string company(const std::string& user) { return drive_.path(user + ".qbw").string(); }
+  void TearDown() override {
+    stop_ = true;
+    for (auto& player : players_) player.join();
+    for (const pid_t child : children_) {
+      ::kill(child, SIGKILL);
+      ::waitpid(child, nullptr, 0);
+    }
+  }
+
+  test::TemporaryDrive drive_;
+  ServiceConfig config_;
+  std::optional<Service> service_;
+  std::atomic<bool> stop_ = false;
+  std::vector<std::thread> players_;
+  std::vector<pid_t> children_;
+};
+
+TEST_F(RemoteExchangeTest, TheDemoRunsOnTwoRemoteCompanyFiles) {
+  keepPlaying("alice");
+  keepPlayingElsewhere("bob");
+  std::istringstream in;
+  std::ostringstream out;
+  std::ostringstream err;
+  const std::string path = company("alice");
+  const char* argv[] = {"droqbxml",  "--processor", "DroQbXml.WebConnector",
+                        "--company", path.c_str(),  "demo"};
+  EXPECT_EQ(cli::run(6, argv, in, out, err), cli::kExitSuccess) << out.str() << err.str();
+  EXPECT_NE(out.str().find(" 0 unexpected."), std::string::npos) << out.str();
+}
+
+TEST_F(RemoteExchangeTest, LoginsAnsweredAsTheWebConnectorExpects) {
+  Player wrong(options("alice", "bob"), simulator::createProcessor());
+  EXPECT_EQ(wrong.run().outcome, "nvu");
+  Player nobody(options("carol", "carol"), simulator::createProcessor());
+  EXPECT_EQ(nobody.run().outcome, "nvu");
+  Player idle(options("alice", "alice"), simulator::createProcessor());
+  EXPECT_EQ(idle.run().outcome, "none");  // no host waits on her company file
+}
+
+TEST_F(RemoteExchangeTest, HostCallsFailCleanlyWithoutAWebConnector) {
+  const auto processor = service_->newProcessor({200ms, 200ms});
+  EXPECT_TRUE(test::raises(
+      [&] { processor->BeginSession(fromUtf8(company("alice")), qbFileOpenDoNotCare); },
+      Hresult::kUnexpected, kWebConnectorProgId,
+      u"The method \"OpenConnection\" has not been called."));
+  processor->OpenConnection(u"", u"Host");
+  const Text message =
+      u"Could not start QuickBooks: no Web Connector logged in for the company "
+      u"file \"" +
+      fromUtf8(company("alice")) + u"\" within 0 s.";
+  EXPECT_TRUE(test::raises(
+      [&] { processor->BeginSession(fromUtf8(company("alice")), qbFileOpenDoNotCare); },
+      Hresult::kCouldNotStart, kWebConnectorProgId, message));
+}
+
+// Drives the service call by call, as a Web Connector that misbehaves would.
+TEST_F(RemoteExchangeTest, ProtocolMisstepsReachNothing) {
+  const auto host = service_->newProcessor({5s, 5s});
+  host->OpenConnection(u"", u"Host");
+  auto session = std::async(std::launch::async, [&] {
+    return host->BeginSession(fromUtf8(company("alice")), qbFileOpenDoNotCare);
+  });
+  Player web(options("alice", "alice"), simulator::createProcessor());
+  const auto call = [&](const char* op, const Params& params) {
+    return web.call(op, params).parameter(std::string(op) + "Result");
+  };
+  std::string ticket;
+  while (ticket.empty()) {  // until the host's BeginSession is waiting
+    const SoapMessage login =
+        web.call("authenticate", {{"strUserName", "alice"}, {"strPassword", "alice"}});
+    if (login.strings.at(1) != "none") ticket = login.strings.at(0);
+  }
+  EXPECT_EQ(call("receiveResponseXML", {{"ticket", ticket}, {"response", "<QBXML/>"}}), "-1");
+  EXPECT_EQ(call("getLastError", {{"ticket", ticket}}),
+            "A response came for no request; it was dropped.");
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", "0123456789abcdef0123456789abcdef"}}), "");
+  EXPECT_EQ(call("getLastError", {{"ticket", "forged"}}), "The ticket is unknown or has expired.");
+  // QuickBooks opens the file: the session begins; no request yet, so the Web Connector pauses.
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", ticket}, {"strCompanyFileName", company("alice")}}),
+            "");
+  EXPECT_EQ(call("getLastError", {{"ticket", ticket}}), "NoOp");
+  const Text hostTicket = session.get();
+  EXPECT_EQ(toUtf8(host->GetCurrentCompanyFileName(hostTicket)), company("alice"));
+
+  // The Web Connector takes a request and disappears; when it logs in again the request
+  // fails (it may have reached QuickBooks) and the next one goes through the new session.
+  auto lost = std::async(std::launch::async,
+                         [&] { return host->ProcessRequest(hostTicket, fromUtf8(kQuery)); });
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", ticket}}), kQuery);
+  const SoapMessage again =
+      web.call("authenticate", {{"strUserName", "alice"}, {"strPassword", "alice"}});
+  EXPECT_TRUE(test::raises([&] { lost.get(); }, Hresult::kUnexpected, kWebConnectorProgId,
+                           u"The Web Connector session ended (the Web Connector logged in again) "
+                           u"before QuickBooks answered; the request may have been processed."));
+  EXPECT_EQ(call("closeConnection", {{"ticket", ticket}}), "The ticket is unknown or has expired.");
+  auto next = std::async(std::launch::async,
+                         [&] { return host->ProcessRequest(hostTicket, fromUtf8(kQuery)); });
+  const std::string fresh = again.strings.at(0);
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", fresh}, {"strCompanyFileName", company("alice")}}),
+            kQuery);
+  // Asked for another request before answering this one: the one sent fails.
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", fresh}}), "");
+  EXPECT_TRUE(test::raises([&] { next.get(); }, Hresult::kUnexpected, kWebConnectorProgId,
+                           u"The Web Connector asked for another request before answering this "
+                           u"one; the request may have been processed."));
+  // QuickBooks' own failure comes back as the processor's error; the Web Connector is told.
+  auto refused =
+      std::async(std::launch::async, [&] { return host->ProcessRequest(hostTicket, u"<QBXML>"); });
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", fresh}}), "<QBXML>");
+  EXPECT_EQ(
+      call("receiveResponseXML",
+           {{"ticket", fresh},
+            {"hresult", "0x80040400"},
+            {"message", "QuickBooks found an error when parsing the provided XML text stream."}}),
+      "-1");
+  EXPECT_TRUE(
+      test::raises([&] { refused.get(); }, static_cast<int32_t>(0x80040400u), kWebConnectorProgId,
+                   u"QuickBooks found an error when parsing the provided XML text stream."));
+  EXPECT_EQ(call("closeConnection", {{"ticket", fresh}}), "OK");
+  EXPECT_EQ(call("sendRequestXML", {{"ticket", fresh}}), "");  // a replayed ticket
+  host->EndSession(hostTicket);
+}
+
+TEST_F(RemoteExchangeTest, BadMessagesGetFaultsAndSlowClientsHoldNobodyUp) {
+  // A client that sends half a request and waits.
+  const int slow = ::socket(AF_INET, SOCK_STREAM, 0);
+  sockaddr_in address{};
+  address.sin_family = AF_INET;
+  address.sin_port = htons(service_->port());
+  address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+  ASSERT_EQ(::connect(slow, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  const std::string half = "POST /qbwc HTTP/1.1\r\nHost: x\r\nContent-Length: 100\r\n\r\n<soap";
+  ASSERT_GT(::send(slow, half.data(), half.size(), 0), 0);
+
+  httplib::Client client("127.0.0.1", service_->port());
+  const auto post = [&](const std::string& body) { return client.Post("/qbwc", body, "text/xml"); };
+  const auto malformed = post("<soap:Envelope");
+  ASSERT_TRUE(malformed);
+  EXPECT_EQ(malformed->status, 500);
+  EXPECT_NE(malformed->body.find("<faultcode>soap:Client</faultcode>"), std::string::npos);
+  const auto entity = post("<!DOCTYPE x [<!ENTITY a \"b\">]><x>&a;</x>");
+  EXPECT_EQ(entity->status, 500);
+  const auto huge = post(std::string(config_.maxBodyBytes + 1, 'x'));
+  ASSERT_TRUE(huge);
+  EXPECT_EQ(huge->status, 413);
+  const auto version = post(soapCall("serverVersion", {}));
+  EXPECT_EQ(version->status, 200);
+  EXPECT_NE(version->body.find("<serverVersionResult>DroQbXml "), std::string::npos);
+  ::close(slow);
+}
+
+TEST_F(RemoteExchangeTest, StoppingFailsWhatWasNotSent) {
+  keepPlaying("alice");
+  const auto host = service_->newProcessor({5s, 5s});
+  host->OpenConnection(u"", u"Host");
+  const Text ticket = host->BeginSession(fromUtf8(company("alice")), qbFileOpenDoNotCare);
+  EXPECT_NE(host->ProcessRequest(ticket, fromUtf8(kQuery)).find(u"CustomerQueryRs"), Text::npos);
+  service_->stop(1s);
+  EXPECT_TRUE(test::raises([&] { host->ProcessRequest(ticket, fromUtf8(kQuery)); },
+                           Hresult::kUnexpected, kWebConnectorProgId,
+                           u"The DroQbXml service is stopping; the request was not sent."));
+}
+
+}  // namespace
+}  // namespace droqbxml::webconnector
