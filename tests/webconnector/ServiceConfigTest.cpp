@@ -89,8 +89,8 @@ TEST(ServiceConfigTest, SetUserPasswordKeepsEveryOtherLine) {
   const test::TemporaryDrive folder;
   const auto file = folder.path("wc.conf");
   const std::string before =
-      "# Web Connector service\nport = 8080\n\n[user alice]\n# Alice's books\n"
-      "password = old\ncompany = C:\\A.qbw\n\n[user bob]\ncompany = C:\\B.qbw\n";
+      "# Web Connector service\nport = 8080\n\n[user bob]\ncompany = C:\\B.qbw\n\n"
+      "[user alice]\n# Alice's books\npassword = old\ncompany = C:\\A.qbw\n";
   test::writeFile(file, before);
   ::chmod(file.c_str(), 0644);
 
@@ -101,11 +101,10 @@ TEST(ServiceConfigTest, SetUserPasswordKeepsEveryOtherLine) {
   const auto config = readServiceConfig(file);
   const auto hash = [&](const char* user) { return config.user(user)->passwordHash; };
   EXPECT_EQ(test::readFile(file),
-            "# Web Connector service\nport = 8080\n\n[user alice]\n# Alice's books\npassword = " +
-                hash("alice") +
-                "\ncompany = C:\\A.qbw\n\n[user bob]\ncompany = C:\\Books\\Bob 2.qbw\n"
-                "password = " +
-                hash("bob") + "\n\n[user carol]\npassword = " + hash("carol") + "\n");
+            "# Web Connector service\nport = 8080\n\n[user bob]\n"
+            "company = C:\\Books\\Bob 2.qbw\npassword = " +
+                hash("bob") + "\n\n[user alice]\n# Alice's books\npassword = " + hash("alice") +
+                "\ncompany = C:\\A.qbw\n\n[user carol]\npassword = " + hash("carol") + "\n");
   EXPECT_TRUE(passwordMatches(hash("bob"), "s3cret"));
   EXPECT_FALSE(passwordMatches(hash("bob"), "w0rd"));
   EXPECT_TRUE(passwordMatches(hash("alice"), "w0rd"));
