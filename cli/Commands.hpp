@@ -179,6 +179,21 @@ int demoCommand(Io io, const ConnectionOptions& connection, bool verbose = false
 // unreadable file and returns nothing.
 std::optional<std::string> readDocument(Io io, const std::string& file);
 
+// Sets `user`'s password (read as one line from the input, without echo on a terminal) and,
+// when given, company file in the Web Connector service's configuration file, creating the
+// file or the user's section when missing. An empty password, a user name holding white
+// space or ']' and a file that cannot be written end with kExitUsage.
+int webConnectorPasswdCommand(Io io, const std::string& configFile, const std::string& user,
+                              const std::optional<std::string>& company);
+// Writes the .qwc file that adds the service to a Web Connector for `user`, who must have a
+// section in the configuration file: to `output` (never over an existing file) or to the
+// output stream. The AppURL defaults to the address, port and path the service listens on;
+// `everyMinutes` 0 leaves the schedule to the Web Connector's user. Refusals end with
+// kExitUsage.
+int webConnectorQwcCommand(Io io, const std::string& configFile, const std::string& user,
+                           const std::optional<std::string>& appUrl, int everyMinutes,
+                           const std::optional<std::string>& output);
+
 }  // namespace droqbxml::cli
 
 #endif  // DROQBXML_CLI_COMMANDS_HPP_
