@@ -280,6 +280,25 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
   auto* serve = web->add_subcommand(
       "serve", "Run the Web Connector service in the foreground until SIGTERM (log on stderr)");
   serve->add_option("--config", wcConfig, "Service configuration file")->required();
+  std::string wcUser;
+  std::optional<std::string> wcCompany;
+  auto* passwd = web->add_subcommand(
+      "passwd", "Set a Web Connector user's password (read from standard input) in the file");
+  passwd->add_option("--config", wcConfig, "Service configuration file (created when missing)")
+      ->required();
+  passwd->add_option("USER", wcUser, "User name")->required();
+  passwd->add_option("--company", wcCompany, "The company file this user's Web Connector serves");
+  std::optional<std::string> appUrl;
+  std::optional<std::string> qwcOutput;
+  int everyMinutes = 1;
+  auto* qwc = web->add_subcommand(
+      "qwc", "Write the .qwc file a QuickBooks administrator adds to the Web Connector");
+  qwc->add_option("--config", wcConfig, "Service configuration file")->required();
+  qwc->add_option("USER", wcUser, "User name the Web Connector logs in as")->required();
+  qwc->add_option("--app-url", appUrl, "The service's URL as the Web Connector reaches it");
+  qwc->add_option("--every", everyMinutes, "Minutes between scheduled runs (0: none)")
+      ->capture_default_str();
+  qwc->add_option("--output,-o", qwcOutput, "File to write (default: standard output)");
   PlayOptions play;
   auto* playCommand = web->add_subcommand(
       "play", "Play the Web Connector against a service, relaying to the embedded stand-in");
@@ -345,6 +364,10 @@ int runCommand(int argc, const char* const* argv, std::istream& in, std::ostream
     if (relay->parsed()) return relayCommand(io, port, connection);
     if (serve->parsed()) return webConnectorServeCommand(io, wcConfig);
     if (playCommand->parsed()) return webConnectorPlayCommand(io, play);
+    if (passwd->parsed()) return webConnectorPasswdCommand(io, wcConfig, wcUser, wcCompany);
+    if (qwc->parsed()) {
+      return webConnectorQwcCommand(io, wcConfig, wcUser, appUrl, everyMinutes, qwcOutput);
+    }
   } catch (const ComError& error) {
     err << "droqbxml: " << error.what() << " (error " << error.number() << ", "
         << toUtf8(error.source()) << ")\n";
