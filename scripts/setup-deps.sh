@@ -7,7 +7,7 @@ set -euo pipefail
 
 packages=(cmake ninja-build g++ make libgtest-dev libgmock-dev libbenchmark-dev libcli11-dev
   libsqlite3-dev libexpat1-dev libxml2-utils libpugixml-dev nlohmann-json3-dev pkg-config
-  python3 libcpp-httplib-dev libsodium-dev)
+  python3 libcpp-httplib-dev libsodium-dev openssl)
 if [ "${1:-}" = com ]; then
   packages+=(wine wine64 g++-mingw-w64-x86-64 mingw-w64-tools libwine-dev)
 fi

@@ -51,6 +51,7 @@ Player::Player(PlayerOptions options, std::shared_ptr<RequestProcessor> quickBoo
   client_->path = options_.url.substr(path);
   client_->http->set_read_timeout(options_.timeout);
   client_->http->set_keep_alive(true);
+  client_->http->set_tcp_nodelay(true);
   client_->http->enable_server_certificate_verification(options_.verifyCertificate);
   if (!options_.caFile.empty()) client_->http->set_ca_cert_path(options_.caFile.c_str());
 }

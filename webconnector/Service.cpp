@@ -137,6 +137,7 @@ void Service::start() {
   http.set_read_timeout(5, 0);
   http.set_write_timeout(5, 0);
   http.set_keep_alive_max_count(1000);
+  http.set_tcp_nodelay(true);  // answers are small: no waiting for the peer's acknowledgement
   const auto holdLimit =
       static_cast<time_t>(std::chrono::duration_cast<std::chrono::seconds>(config_.hold).count());
   http.set_keep_alive_timeout(std::max<time_t>(5, holdLimit));

@@ -2,6 +2,7 @@
 // "DroQbXml.WebConnector", a player plays Intuit's Web Connector and relays each request
 // into the embedded stand-in, and misbehaving clients get the protocol's answers.
 #include <arpa/inet.h>
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <httplib.h>
 #include <spawn.h>
@@ -11,6 +12,7 @@
 
 #include <atomic>
 #include <csignal>
+#include <cstdlib>
 #include <future>
 #include <optional>
 #include <sstream>
@@ -267,6 +269,115 @@ TEST_F(RemoteExchangeTest, StoppingFailsWhatWasNotSent) {
   EXPECT_TRUE(test::raises([&] { host->ProcessRequest(ticket, fromUtf8(kQuery)); },
                            Hresult::kUnexpected, kWebConnectorProgId,
                            u"The DroQbXml service is stopping; the request was not sent."));
+}
+
+TEST(WebConnectorBrokerTest, TicketsExpire) {
+  ServiceConfig config;
+  config.ticketLifetime = std::chrono::seconds(1);
+  config.users.push_back({"erin", hashPassword("erin", HashCost::Cheap), "e.qbw"});
+  Broker broker(config);
+  auto host = std::async(std::launch::async, [&] {
+    try {
+      broker.beginHostSession("e.qbw", 1200ms);
+    } catch (const ComError&) {
+    }
+  });
+  std::vector<std::string> login{"", "none"};
+  while (login[1] == "none") login = broker.authenticate("erin", "erin");
+  std::this_thread::sleep_for(1100ms);
+  EXPECT_EQ(broker.sendRequestXML(login[0], "e.qbw", "13", "0"), "");
+  EXPECT_EQ(broker.getLastError(login[0]), "The ticket is unknown or has expired.");
+}
+
+// Over HTTPS with a certificate the player trusts; a client that does not trust it gets no
+// answer at all.
+TEST(WebConnectorHttpsTest, ServesOverTls) {
+  const test::TemporaryDrive drive;
+  const std::string key = drive.path("server.key").string();
+  const std::string certificate = drive.path("server.pem").string();
+  const std::string make =
+      "openssl req -x509 -newkey rsa:2048 -nodes -days 1 -subj /CN=127.0.0.1 "
+      "-addext subjectAltName=IP:127.0.0.1 -keyout " +
+      key + " -out " + certificate + " 2>/dev/null";
+  ASSERT_EQ(std::system(make.c_str()), 0);
+  ServiceConfig config;
+  config.port = 0;
+  config.certificate = certificate;
+  config.privateKey = key;
+  config.users.push_back({"dave", hashPassword("dave", HashCost::Cheap), "d.qbw"});
+  Service service(config);
+  service.start();
+  ASSERT_EQ(service.url().rfind("https://127.0.0.1:", 0), 0u);
+  PlayerOptions trusting;
+  trusting.url = service.url();
+  trusting.user = trusting.password = "dave";
+  trusting.caFile = certificate;
+  EXPECT_EQ(Player(trusting, simulator::createProcessor()).run().outcome, "none");
+  PlayerOptions wary = trusting;
+  wary.caFile.clear();
+  EXPECT_THROW(Player(wary, simulator::createProcessor()).run(), PlayerError);
+}
+
+// droqbxml webconnector serve in a process of its own: a host reaches it with --processor
+// DroQbXml.WebConnector, a player in another process relays, SIGTERM stops it cleanly.
+TEST(WebConnectorServeTest, ServesHostsUntilSigterm) {
+  const test::TemporaryDrive drive;
+  const std::string company = drive.path("served.qbw").string();
+  simulator::CompanyFile::create(company, {"Served", true, {cli::componentAppName()}});
+  const int port = 20000 + ::getpid() % 20000;
+  const std::string relayPort = std::to_string(port + 1);
+  const std::string config = drive.path("wc.conf").string();
+  test::writeFile(config, "port = " + std::to_string(port) + "\nrelay-port = " + relayPort +
+                              "\nhold-seconds = 1\n[user carol]\npassword = " +
+                              hashPassword("carol", HashCost::Cheap) + "\ncompany = " + company +
+                              "\n");
+  test::writeFile(drive.path("carol.password"), "carol\n");
+  const auto spawn = [](std::vector<std::string> args, const std::string& log) {
+    std::vector<char*> argv{const_cast<char*>(DROQBXML_COMMAND)};
+    for (auto& arg : args) argv.push_back(arg.data());
+    argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 2, log.c_str(), O_WRONLY | O_CREAT, 0600);
+    pid_t child = 0;
+    EXPECT_EQ(::posix_spawn(&child, argv[0], &actions, nullptr, argv.data(), environ), 0);
+    posix_spawn_file_actions_destroy(&actions);
+    return child;
+  };
+  const std::string serveLog = drive.path("serve.log").string();
+  const pid_t serve = spawn({"webconnector", "serve", "--config", config}, serveLog);
+  const std::string url = "http://127.0.0.1:" + std::to_string(port) + "/qbwc";
+  const pid_t player =
+      spawn({"webconnector", "play", "--url", url, "--user", "carol", "--password-file",
+             drive.path("carol.password").string(), "--runs", "0", "--every", "0"},
+            drive.path("play.log").string());
+
+  ::setenv("DROQBXML_WEBCONNECTOR_PORT", relayPort.c_str(), 1);
+  std::istringstream in;
+  std::ostringstream out;
+  std::ostringstream err;
+  const char* argv[] = {"droqbxml",      "--processor", "DroQbXml.WebConnector",
+                        "--wait",        "20",          "--company",
+                        company.c_str(), "query",       "customer"};
+  int status = -1;
+  for (int attempt = 0; attempt < 50 && status != cli::kExitSuccess; ++attempt) {
+    status = cli::run(9, argv, in, out, err);  // until the service listens
+    if (status != cli::kExitSuccess) std::this_thread::sleep_for(100ms);
+  }
+  ::unsetenv("DROQBXML_WEBCONNECTOR_PORT");
+  EXPECT_EQ(status, cli::kExitSuccess) << err.str();
+  EXPECT_NE(out.str().find("<CustomerQueryRs"), std::string::npos);
+
+  ::kill(serve, SIGTERM);
+  int exit = -1;
+  ::waitpid(serve, &exit, 0);
+  EXPECT_TRUE(WIFEXITED(exit) && WEXITSTATUS(exit) == 0);
+  const std::string log = test::readFile(serveLog);
+  EXPECT_NE(log.find("authenticate: user 'carol' logged in"), std::string::npos) << log;
+  EXPECT_NE(log.find("stopping on SIGTERM"), std::string::npos) << log;
+  EXPECT_EQ(log.find("carol\n"), std::string::npos);  // the password is never logged
+  ::kill(player, SIGKILL);
+  ::waitpid(player, nullptr, 0);
 }
 
 }  // namespace
