@@ -106,7 +106,15 @@ int webConnectorPlayCommand(Io io, const PlayOptions& options) {
     webconnector::Player web(player, simulator::createProcessor());
     for (int run = 1; options.runs == 0 || run <= options.runs; ++run) {
       if (run > 1) std::this_thread::sleep_for(std::chrono::seconds(options.every));
-      const webconnector::RunResult result = web.run();
+      webconnector::RunResult result;
+      try {
+        result = web.run();
+      } catch (const webconnector::PlayerError& error) {
+        // As the Web Connector does, a run that fails is reported and the next one is made.
+        io.err << timestamp() << " run " << run << ": " << error.what() << std::endl;
+        if (options.runs != 0 && run == options.runs) return kExitConnection;
+        continue;
+      }
       io.out << timestamp() << " run " << run << ": " << result.outcome << ", " << result.requests
              << " request(s)" << (result.closeMessage.empty() ? "" : ", " + result.closeMessage)
              << std::endl;

@@ -66,7 +66,8 @@ SoapMessage Player::call(std::string_view operation,
                                           "text/xml; charset=utf-8");
   if (!answer) {
     lastStatus_ = 0;
-    throw PlayerError(std::string(operation) + ": " + httplib::to_string(answer.error()));
+    throw PlayerError(std::string(operation) + ": no answer from " + options_.url + " (" +
+                      httplib::to_string(answer.error()) + ")");
   }
   lastStatus_ = answer->status;
   try {
