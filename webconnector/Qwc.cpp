@@ -8,32 +8,13 @@
 #include <stdexcept>
 #include <string_view>
 
+#include "webconnector/Soap.hpp"
 #include "webconnector/internal/Sodium.hpp"
 
 namespace droqbxml::webconnector {
 namespace {
 
 constexpr std::string_view kLineEnd = "\r\n";
-
-std::string escaped(std::string_view text) {
-  std::string out;
-  for (const char c : text) {
-    switch (c) {
-      case '&':
-        out += "&amp;";
-        break;
-      case '<':
-        out += "&lt;";
-        break;
-      case '>':
-        out += "&gt;";
-        break;
-      default:
-        out += c;
-    }
-  }
-  return out;
-}
 
 std::string lower(std::string_view text) {
   std::string out(text);
@@ -74,7 +55,7 @@ void element(std::string& out, int indent, std::string_view name, std::string_vi
   out += '<';
   out += name;
   out += '>';
-  out += escaped(text);
+  out += xmlEscaped(text);
   out += "</";
   out += name;
   out += '>';

@@ -159,32 +159,11 @@ void installHandlers(XML_Parser parser) {
   XML_SetParamEntityParsing(parser, XML_PARAM_ENTITY_PARSING_NEVER);
 }
 
-void appendEscaped(std::string& out, std::string_view text) {
-  for (const char c : text) {
-    switch (c) {
-      case '&':
-        out += "&amp;";
-        break;
-      case '<':
-        out += "&lt;";
-        break;
-      case '>':
-        out += "&gt;";
-        break;
-      case '\r':  // a literal CR would reach the reader as a line feed
-        out += "&#xD;";
-        break;
-      default:
-        out += c;
-    }
-  }
-}
-
 void appendElement(std::string& out, std::string_view name, std::string_view text) {
   out += '<';
   out += name;
   out += '>';
-  appendEscaped(out, text);
+  out += xmlEscaped(text);
   out += "</";
   out += name;
   out += '>';
@@ -223,6 +202,30 @@ std::string result(std::string_view operation, std::string_view escapedValue) {
 }
 
 }  // namespace
+
+std::string xmlEscaped(std::string_view text) {
+  std::string out;
+  out.reserve(text.size());
+  for (const char c : text) {
+    switch (c) {
+      case '&':
+        out += "&amp;";
+        break;
+      case '<':
+        out += "&lt;";
+        break;
+      case '>':
+        out += "&gt;";
+        break;
+      case '\r':  // a literal CR would reach the reader as a line feed
+        out += "&#xD;";
+        break;
+      default:
+        out += c;
+    }
+  }
+  return out;
+}
 
 const std::string& SoapMessage::parameter(std::string_view name) const {
   static const std::string kNone;
@@ -266,9 +269,7 @@ std::string soapCall(std::string_view operation,
 }
 
 std::string soapStringResult(std::string_view operation, std::string_view value) {
-  std::string escaped;
-  appendEscaped(escaped, value);
-  return result(operation, escaped);
+  return result(operation, xmlEscaped(value));
 }
 
 std::string soapIntResult(std::string_view operation, int value) {

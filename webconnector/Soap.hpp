@@ -47,6 +47,10 @@ std::string soapStringResult(std::string_view operation, std::string_view value)
 std::string soapIntResult(std::string_view operation, int value);
 // ...<operationResult><string>a</string><string>b</string></operationResult>...
 std::string soapStringsResult(std::string_view operation, const std::vector<std::string>& values);
+// Text for an element's content: & < > escaped, and CR as a character reference, since a
+// literal one reaches a reader as a line feed.
+std::string xmlEscaped(std::string_view text);
+
 // A SOAP 1.1 fault: faultcode "soap:Client" or "soap:Server" and the message.
 std::string soapFault(std::string_view faultCode, std::string_view message);
 
