@@ -52,13 +52,7 @@ std::string origin(const std::string& url) {
 
 void element(std::string& out, int indent, std::string_view name, std::string_view text) {
   out.append(static_cast<size_t>(indent), ' ');
-  out += '<';
-  out += name;
-  out += '>';
-  out += xmlEscaped(text);
-  out += "</";
-  out += name;
-  out += '>';
+  appendXmlElement(out, name, text);
   out += kLineEnd;
 }
 

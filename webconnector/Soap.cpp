@@ -159,16 +159,6 @@ void installHandlers(XML_Parser parser) {
   XML_SetParamEntityParsing(parser, XML_PARAM_ENTITY_PARSING_NEVER);
 }
 
-void appendElement(std::string& out, std::string_view name, std::string_view text) {
-  out += '<';
-  out += name;
-  out += '>';
-  out += xmlEscaped(text);
-  out += "</";
-  out += name;
-  out += '>';
-}
-
 std::string envelope(std::string_view body) {
   std::string out =
       "<?xml version=\"1.0\" encoding=\"utf-8\"?><soap:Envelope "
@@ -227,6 +217,16 @@ std::string xmlEscaped(std::string_view text) {
   return out;
 }
 
+void appendXmlElement(std::string& out, std::string_view name, std::string_view text) {
+  out += '<';
+  out += name;
+  out += '>';
+  out += xmlEscaped(text);
+  out += "</";
+  out += name;
+  out += '>';
+}
+
 const std::string& SoapMessage::parameter(std::string_view name) const {
   static const std::string kNone;
   for (const auto& [key, value] : parameters) {
@@ -264,7 +264,7 @@ SoapMessage readSoapMessage(std::string_view body) {
 std::string soapCall(std::string_view operation,
                      const std::vector<std::pair<std::string, std::string>>& parameters) {
   std::string inner;
-  for (const auto& [name, value] : parameters) appendElement(inner, name, value);
+  for (const auto& [name, value] : parameters) appendXmlElement(inner, name, value);
   return envelope(operationElement(operation, inner));
 }
 
@@ -278,14 +278,14 @@ std::string soapIntResult(std::string_view operation, int value) {
 
 std::string soapStringsResult(std::string_view operation, const std::vector<std::string>& values) {
   std::string inner;
-  for (const auto& value : values) appendElement(inner, "string", value);
+  for (const auto& value : values) appendXmlElement(inner, "string", value);
   return result(operation, inner);
 }
 
 std::string soapFault(std::string_view faultCode, std::string_view message) {
   std::string fault = "<soap:Fault>";
-  appendElement(fault, "faultcode", faultCode);
-  appendElement(fault, "faultstring", message);
+  appendXmlElement(fault, "faultcode", faultCode);
+  appendXmlElement(fault, "faultstring", message);
   fault += "</soap:Fault>";
   return envelope(fault);
 }

@@ -50,6 +50,8 @@ std::string soapStringsResult(std::string_view operation, const std::vector<std:
 // Text for an element's content: & < > escaped, and CR as a character reference, since a
 // literal one reaches a reader as a line feed.
 std::string xmlEscaped(std::string_view text);
+// Appends <name>text</name>, the text escaped.
+void appendXmlElement(std::string& out, std::string_view name, std::string_view text);
 
 // A SOAP 1.1 fault: faultcode "soap:Client" or "soap:Server" and the message.
 std::string soapFault(std::string_view faultCode, std::string_view message);
