@@ -17,7 +17,7 @@ build=$root/build/fuzz
 seconds=${1:-60}
 shift || true
 targets=("$@")
-[ ${#targets[@]} -gt 0 ] || targets=(element_value escaping records wrapper_status request_reader stand_in)
+[ ${#targets[@]} -gt 0 ] || targets=(element_value escaping records wrapper_status request_reader stand_in soap)
 jobs=${FUZZ_JOBS:-2}
 shared=${DROQBXML_SHARED_DIR:-$root/../shared}
 testdata=$root/tests/testdata
@@ -26,6 +26,9 @@ testdata=$root/tests/testdata
 # stand-in's reader and the stand-in.
 seed_files() {
   case "$1" in
+    soap)
+      ls "$root"/tests/testdata/webconnector/*.xml 2>/dev/null || true
+      ;;
     request_reader | stand_in)
       ls "$testdata"/requests/*.xml "$testdata"/simulator/reader/*.xml \
         "$testdata"/simulator/schema-samples/*.xml "$testdata"/cli/two_adds.xml \

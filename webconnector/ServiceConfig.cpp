@@ -313,8 +313,9 @@ void setUserPassword(const std::filesystem::path& file, std::string_view user,
     for (size_t at = first; at < end; ++at) {
       if (!trim(lines[at]).empty()) last = at + 1;
     }
-    for (const auto& [key, value] : wanted) {
-      const std::string line = key + " = " + value;
+    for (const auto& setting : wanted) {
+      const std::string& key = setting.first;
+      const std::string line = key + " = " + setting.second;
       const auto found = std::find_if(lines.begin() + static_cast<std::ptrdiff_t>(first),
                                       lines.begin() + static_cast<std::ptrdiff_t>(end),
                                       [&](const std::string& l) { return keyOf(trim(l)) == key; });
