@@ -103,8 +103,12 @@ class RemoteExchangeTest : public ::testing::Test {
     std::vector<char*> argv;
     for (auto& arg : args) argv.push_back(arg.data());
     argv.push_back(nullptr);
+    posix_spawn_file_actions_t quiet;
+    posix_spawn_file_actions_init(&quiet);
+    posix_spawn_file_actions_addopen(&quiet, 1, "/dev/null", O_WRONLY, 0);
     pid_t child = 0;
-    ASSERT_EQ(::posix_spawn(&child, argv[0], nullptr, nullptr, argv.data(), environ), 0);
+    ASSERT_EQ(::posix_spawn(&child, argv[0], &quiet, nullptr, argv.data(), environ), 0);
+    posix_spawn_file_actions_destroy(&quiet);
     children_.push_back(child);
   }
   std::string company(const std::string& user) { return drive_.path(user + ".qbw").string(); }
@@ -161,6 +165,14 @@ TEST_F(RemoteExchangeTest, HostCallsFailCleanlyWithoutAWebConnector) {
   EXPECT_TRUE(test::raises(
       [&] { processor->BeginSession(fromUtf8(company("alice")), qbFileOpenDoNotCare); },
       Hresult::kCouldNotStart, kWebConnectorProgId, message));
+  // QuickBooks cannot open the file: the Web Connector's connectionError is the host's error.
+  keepPlaying("bob");
+  const auto patient = service_->newProcessor({5s, 5s});
+  patient->OpenConnection(u"", u"Host");
+  EXPECT_TRUE(test::raises(
+      [&] { patient->BeginSession(fromUtf8(company("missing")), qbFileOpenDoNotCare); },
+      static_cast<int32_t>(0x80040403u), kWebConnectorProgId,
+      u"Could not open the specified QuickBooks company data file."));
 }
 
 // Drives the service call by call, as a Web Connector that misbehaves would.
@@ -338,6 +350,7 @@ TEST(WebConnectorServeTest, ServesHostsUntilSigterm) {
     argv.push_back(nullptr);
     posix_spawn_file_actions_t actions;
     posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
     posix_spawn_file_actions_addopen(&actions, 2, log.c_str(), O_WRONLY | O_CREAT, 0600);
     pid_t child = 0;
     EXPECT_EQ(::posix_spawn(&child, argv[0], &actions, nullptr, argv.data(), environ), 0);
