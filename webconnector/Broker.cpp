@@ -50,6 +50,14 @@ int16_t versionPart(const std::string& text, int16_t otherwise) {
 
 }  // namespace
 
+std::string loggable(std::string_view text) {
+  std::string shown(text.substr(0, 80));
+  for (char& c : shown) {
+    if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) c = '?';
+  }
+  return text.size() > 80 ? shown + "..." : shown;
+}
+
 std::string newTicket() {
   static const bool ready = sodium_init() >= 0;
   if (!ready) throw std::runtime_error("the cryptographic random source is unavailable");
@@ -167,9 +175,20 @@ bool Broker::holdUntil(std::unique_lock<std::mutex>& lock, Line& line, Clock::ti
 std::vector<std::string> Broker::authenticate(const std::string& user,
                                               const std::string& password) {
   const ServiceUser* known = config_.user(user);
-  // The hash is checked outside the lock: it takes a while on purpose.
-  if (known == nullptr || !passwordMatches(known->passwordHash, password)) {
-    log("authenticate: refused user '" + user + "'");
+  bool matches = false;
+  {
+    // One check at a time, outside the broker's lock: each takes a while and much memory on
+    // purpose, and a flood of logins must not take the machine's memory with it. An unknown
+    // user costs the same as a known one, so that the time does not tell who exists.
+    static std::mutex checking;
+    const std::lock_guard one(checking);
+    const ServiceUser* checked =
+        known != nullptr || config_.users.empty() ? known : &config_.users.front();
+    matches =
+        checked != nullptr && passwordMatches(checked->passwordHash, password) && checked == known;
+  }
+  if (!matches) {
+    log("authenticate: refused user '" + loggable(user) + "'");
     return {newTicket(), "nvu"};
   }
   const std::lock_guard lock(mutex_);
@@ -255,7 +274,7 @@ std::string Broker::connectionError(const std::string& ticket, const std::string
   const std::lock_guard lock(mutex_);
   if (WebSession* session = liveSession(ticket)) {
     Line& line = *session->line;
-    log("connectionError: " + hresult + " " + message);
+    log("connectionError: " + loggable(hresult) + " " + loggable(message));
     line.openFailed = true;
     line.openHresult = hresultOf(hresult);
     line.openMessage = message;

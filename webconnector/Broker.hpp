@@ -20,6 +20,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "webconnector/ServiceConfig.hpp"
@@ -110,6 +111,10 @@ class Broker {
   std::map<std::string, Line*> hostSessions_;
   bool stopping_ = false;
 };
+
+// Text from the network as a log line may show it: at most 80 characters, control
+// characters (line breaks among them) as '?', so that no one writes lines of their own.
+std::string loggable(std::string_view text);
 
 // A fresh ticket: 32 hexadecimal digits from the system's cryptographic random source.
 std::string newTicket();

@@ -9,15 +9,15 @@ namespace droqbxml::webconnector {
 
 struct QwcOptions {
   std::string appName = "DroQbXml";
-  std::string appUrl;       // https://host:port/qbwc (http only for localhost)
-  std::string certUrl;      // empty: the AppURL's scheme, host and port
+  std::string appUrl;   // https://host:port/qbwc (http only for localhost)
+  std::string certUrl;  // empty: the AppURL's scheme, host and port
   std::string description = "DroQbXml job costing";
-  std::string supportUrl;   // empty: the AppURL's scheme, host and port
+  std::string supportUrl;  // empty: the AppURL's scheme, host and port
   std::string userName;
-  std::string ownerId;      // empty: a fresh GUID
-  std::string fileId;       // empty: a fresh GUID
+  std::string ownerId;  // empty: a fresh GUID
+  std::string fileId;   // empty: a fresh GUID
   std::string qbType = "QBFS";
-  int everyMinutes = 1;     // 0: no scheduler element
+  int everyMinutes = 1;  // 0: no scheduler element
 };
 
 // A GUID from the system's cryptographic random source: "{XXXXXXXX-XXXX-4XXX-YXXX-...}".

@@ -143,17 +143,18 @@ void Service::start() {
   http.set_keep_alive_timeout(std::max<time_t>(5, holdLimit));
   Broker& broker = *broker_;
   const Broker::Log log = log_;
-  http.Post(
-      config_.path, [&broker, log](const httplib::Request& request, httplib::Response& response) {
-        try {
-          response.set_content(dispatch(broker, readSoapMessage(request.body)), kXml);
-        } catch (const SoapError& error) {
-          if (log)
-            log(std::string("refused a message from ") + request.remote_addr + ": " + error.what());
-          response.status = 500;
-          response.set_content(soapFault("soap:Client", error.what()), kXml);
-        }
-      });
+  http.Post(config_.path,
+            [&broker, log](const httplib::Request& request, httplib::Response& response) {
+              try {
+                response.set_content(dispatch(broker, readSoapMessage(request.body)), kXml);
+              } catch (const SoapError& error) {
+                if (log)
+                  log(std::string("refused a message from ") + request.remote_addr + ": " +
+                      loggable(error.what()));
+                response.status = 500;
+                response.set_content(soapFault("soap:Client", error.what()), kXml);
+              }
+            });
   server->port = config_.port == 0
                      ? http.bind_to_any_port(config_.listen)
                      : (http.bind_to_port(config_.listen, config_.port) ? config_.port : -1);

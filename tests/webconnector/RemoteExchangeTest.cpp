@@ -283,6 +283,12 @@ TEST_F(RemoteExchangeTest, StoppingFailsWhatWasNotSent) {
                            u"The DroQbXml service is stopping; the request was not sent."));
 }
 
+TEST(WebConnectorBrokerTest, LogsShowNetworkTextOnOneLine) {
+  EXPECT_EQ(loggable("eve\n2026-11-25 authenticate: user 'root' logged in"),
+            "eve?2026-11-25 authenticate: user 'root' logged in");
+  EXPECT_EQ(loggable(std::string(100, 'x')), std::string(80, 'x') + "...");
+}
+
 TEST(WebConnectorBrokerTest, TicketsExpire) {
   ServiceConfig config;
   config.ticketLifetime = std::chrono::seconds(1);
