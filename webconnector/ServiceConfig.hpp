@@ -11,7 +11,8 @@
 //   relay-port = 7372           loopback port where hosts reach the service
 //   ticket-minutes = 30         a ticket's life from authenticate
 //   hold-seconds = 10           how long a Web Connector call waits for the host's next step
-//   max-body-kb = 10240         the largest request body accepted
+//   max-body-kb = 102400        the largest request body accepted (a response from
+//                               QuickBooks to a large query comes as one)
 //   app-name = DroQbXml         the name written into .qwc files
 //
 //   [user alice]
@@ -47,7 +48,7 @@ struct ServiceConfig {
   uint16_t relayPort = 7372;
   std::chrono::seconds ticketLifetime{30 * 60};
   std::chrono::milliseconds hold{std::chrono::seconds(10)};
-  size_t maxBodyBytes = 10 * 1024 * 1024;
+  size_t maxBodyBytes = 100 * 1024 * 1024;
   std::string appName = "DroQbXml";
   std::vector<ServiceUser> users;
 

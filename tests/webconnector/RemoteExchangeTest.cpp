@@ -50,6 +50,7 @@ class RemoteExchangeTest : public ::testing::Test {
     config_.users.push_back({"bob", hashPassword("bob", HashCost::Cheap), ""});
     config_.port = 0;
     config_.hold = 300ms;
+    config_.maxBodyBytes = 1 << 20;
     service_.emplace(config_);
     service_->start();
     install(*service_, {3s, 3s});
