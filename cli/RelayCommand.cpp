@@ -22,6 +22,7 @@
 #include <cerrno>
 #include <chrono>
 #include <cstdint>
+#include <cstdlib>
 #include <optional>
 #include <string>
 #include <thread>
@@ -223,8 +224,10 @@ class RelayClient final : public RequestProcessor {
                  u"The DroQbXml Web Connector service closed the connection.");
     }
     if (reply[0] == "OK") return reply.size() > 1 ? fromUtf8(reply[1]) : Text();
-    raiseError(static_cast<int32_t>(std::stoll("0" + (reply.size() > 1 ? reply[1] : ""))),
-               Text(webconnector::kWebConnectorProgId), fromUtf8(reply.size() > 2 ? reply[2] : ""));
+    // HRESULTs travel as signed decimals ("-2147220477" for 0x80040403).
+    raiseError(
+        static_cast<int32_t>(std::strtoll(reply.size() > 1 ? reply[1].c_str() : "", nullptr, 10)),
+        Text(webconnector::kWebConnectorProgId), fromUtf8(reply.size() > 2 ? reply[2] : ""));
   }
 
   int port_;

@@ -384,9 +384,14 @@ TEST(WebConnectorServeTest, ServesHostsUntilSigterm) {
     status = cli::run(9, argv, in, out, err);  // until the service listens
     if (status != cli::kExitSuccess) std::this_thread::sleep_for(100ms);
   }
-  ::unsetenv("DROQBXML_WEBCONNECTOR_PORT");
   EXPECT_EQ(status, cli::kExitSuccess) << err.str();
   EXPECT_NE(out.str().find("<CustomerQueryRs"), std::string::npos);
+  // A company file no user serves: refused at once, QuickBooks' HRESULT intact.
+  std::ostringstream refused;
+  argv[6] = "C:\\other.qbw";
+  EXPECT_EQ(cli::run(9, argv, in, out, refused), cli::kExitConnection);
+  EXPECT_NE(refused.str().find("(0x80040403)"), std::string::npos) << refused.str();
+  ::unsetenv("DROQBXML_WEBCONNECTOR_PORT");
 
   ::kill(serve, SIGTERM);
   int exit = -1;
