@@ -120,7 +120,11 @@ int64_t fileLength(TextView path) {
   return static_cast<int64_t>(size);
 }
 
-TextFile::TextFile(TextView path, OpenMode mode) {
+namespace {
+
+// The file-system path of a file to open, refusing an empty path and a folder as the
+// platform refuses them.
+std::filesystem::path filePath(TextView path) {
   if (path.empty()) raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
   ensureDrive(path);
   const auto mapped = mapPath(path);
@@ -128,6 +132,13 @@ TextFile::TextFile(TextView path, OpenMode mode) {
   if (std::filesystem::is_directory(mapped, ignored)) {
     raiseRuntimeError(RuntimeError::kPathFileAccessError);
   }
+  return mapped;
+}
+
+}  // namespace
+
+TextFile::TextFile(TextView path, OpenMode mode) {
+  const auto mapped = filePath(path);
   errno = 0;
 #ifdef _WIN32
   // Windows paths are UTF-16; the narrow fopen would go through the ANSI code page.
@@ -173,13 +184,7 @@ HANDLE handleOf(std::intptr_t handle) { return reinterpret_cast<HANDLE>(handle);
 }  // namespace
 
 LockedLogFile::LockedLogFile(TextView path) {
-  if (path.empty()) raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
-  ensureDrive(path);
-  const auto mapped = mapPath(path);
-  std::error_code ignored;
-  if (std::filesystem::is_directory(mapped, ignored)) {
-    raiseRuntimeError(RuntimeError::kPathFileAccessError);
-  }
+  const auto mapped = filePath(path);
   const HANDLE file = CreateFileW(mapped.c_str(), GENERIC_WRITE,
                                   FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
                                   OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
@@ -231,13 +236,7 @@ void LockedLogFile::append(TextView text) {
 #else
 
 LockedLogFile::LockedLogFile(TextView path) {
-  if (path.empty()) raiseRuntimeError(RuntimeError::kBadFileNameOrNumber);
-  ensureDrive(path);
-  const auto mapped = mapPath(path);
-  std::error_code ignored;
-  if (std::filesystem::is_directory(mapped, ignored)) {
-    raiseRuntimeError(RuntimeError::kPathFileAccessError);
-  }
+  const auto mapped = filePath(path);
   const int file = ::open(mapped.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666);
   if (file < 0) raiseForErrno(errno);
   int locked = 0;
