@@ -62,7 +62,7 @@ class CompanyFile {
 
   // Opens an existing company file. Throws CompanyFileError: Missing, Unreadable,
   // NotACompanyFile (not SQLite, or SQLite without the company-file marker), Damaged (SQLite's
-  // integrity check fails), ReadOnly (the file or its folder cannot be written: the stand-in
+  // quick check fails), ReadOnly (the file or its folder cannot be written: the stand-in
   // must refuse at session begin what it could not change later; never for Mode::ReadOnly,
   // which opens a file that cannot be written and refuses every change), Busy.
   explicit CompanyFile(const std::filesystem::path& path, Mode mode = Mode::ReadWrite);

@@ -240,7 +240,7 @@ Text DroXmlSdkWrapper::ProcessRequest(const Text& sSendText) {
       response = processor().ProcessRequest(sessionTicket_, sSendText);
       received = now();
       SetResponseStatus(ReadStatusCode(response));
-      response = XMLUnEscape(response);
+      unescapeInPlace(response);  // what XMLUnEscape gives, without a copy
       if (responseStatus_ == RSRefNotFound) {
         const Text upper = upperAscii(response);
         if (containsAnyUpper(upper, kEstimateTaxMessages)) {

@@ -211,15 +211,17 @@ size_t entityAt(TextView rest, char16_t& character) {
 // replaceEntities and then the reference scan, in a single pass over s: an "&" of the
 // entity-replaced text is an "&" that starts no entity or one from "&amp;", and what
 // follows it there ("#", digits, ";") stands in s as it is, since no entity gives any of
-// them. False where the two-step form would fall back to the literal procedure.
-bool unescapeInOnePass(const Text& s, bool useUnicode, Text& out) {
-  out.clear();
-  out.reserve(s.size());
+// them. False where the two-step form would fall back to the literal procedure. The
+// result goes to `out` piece by piece (append of a range of s, push_back of a character);
+// nothing is written before the first "&", and the result never runs ahead of what has
+// been read, so `out` may write over s itself.
+template <class Out>
+bool unescapeInOnePass(TextView s, bool useUnicode, Out& out) {
   size_t from = 0;
   for (size_t at = findAmpersand(s, 0); at != TextView::npos; at = findAmpersand(s, from)) {
     char16_t character = u'&';
-    const size_t entity = entityAt(TextView(s).substr(at), character);
-    out.append(s, from, at - from);
+    const size_t entity = entityAt(s.substr(at), character);
+    out.append(s, from, at);
     from = at + (entity == 0 ? 1 : entity);
     if (character == u'&' && from < s.size() && s[from] == u'#') {
       const Reference ref = readReference(s, from - 1);
@@ -231,9 +233,33 @@ bool unescapeInOnePass(const Text& s, bool useUnicode, Text& out) {
     }
     out.push_back(character);
   }
-  out.append(s, from, Text::npos);
+  out.append(s, from, s.size());
   return true;
 }
+
+// Writers for unescapeInOnePass: into a new text, over the text read, and nowhere (a dry
+// run that raises what the real one would).
+struct IntoText {
+  Text& out;
+  void append(TextView s, size_t from, size_t to) { out.append(s.substr(from, to - from)); }
+  void push_back(char16_t c) { out.push_back(c); }
+};
+struct OverItself {
+  char16_t* base;          // the text's first unit
+  char16_t* at = nullptr;  // the next unit written; null until something changes
+  void append(TextView s, size_t from, size_t to) {
+    if (at == nullptr) {
+      at = base + to;  // nothing before it changes
+    } else {
+      at = std::char_traits<char16_t>::move(at, s.data() + from, to - from) + (to - from);
+    }
+  }
+  void push_back(char16_t c) { *at++ = c; }
+};
+struct Nowhere {
+  void append(TextView, size_t, size_t) {}
+  void push_back(char16_t) {}
+};
 
 }  // namespace
 
@@ -357,8 +383,24 @@ Text replaceEntities(const Text& s) {
 
 Text XMLUnEscapeText(const Text& s, bool useUnicode) {
   Text out;
-  if (unescapeInOnePass(s, useUnicode, out)) return out;
+  out.reserve(s.size());
+  IntoText into{out};
+  if (unescapeInOnePass(s, useUnicode, into)) return out;
   return unescapeReferencesLiterally(replaceEntities(s), useUnicode);
+}
+
+void unescapeInPlace(Text& s, bool useUnicode) {
+  // A dry run first: it raises what the unescaping would raise, and tells whether the
+  // literal procedure is needed, before anything of s has changed.
+  Nowhere nowhere;
+  if (findAmpersand(s, 0) == TextView::npos) return;
+  if (!unescapeInOnePass(s, useUnicode, nowhere)) {
+    s = unescapeReferencesLiterally(replaceEntities(s), useUnicode);
+    return;
+  }
+  OverItself over{s.data()};
+  unescapeInOnePass(s, useUnicode, over);
+  s.resize(static_cast<size_t>(over.at - s.data()));
 }
 
 }  // namespace droqbxml

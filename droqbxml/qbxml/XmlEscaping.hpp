@@ -33,6 +33,9 @@ Text CutPartialEntity(TextView t);
 // Replaces the five entities (in table order, "&amp;" last), then decimal references.
 // Other named entities, hexadecimal references and a lone "&" are left as they are.
 Text XMLUnEscapeText(const Text& s, bool useUnicode = false);
+// The same, over s itself (no copy of a text that holds nothing to unescape); on an error
+// s is as it was.
+void unescapeInPlace(Text& s, bool useUnicode = false);
 
 }  // namespace droqbxml
 

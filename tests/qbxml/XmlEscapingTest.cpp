@@ -172,7 +172,8 @@ Text referenceUnescape(Text text) {
   return text;
 }
 
-// Texts dense in entities, references and their pieces; the errors are the same too.
+// Texts dense in entities, references and their pieces, unescaped into a new text and in
+// place; the errors are the same too.
 TEST(XmlEscapingTest, OnePassUnescaperAgreesWithTheReference) {
   std::mt19937 random(20261126);
   const TextView pieces[] = {u"&", u"#",     u";",      u"6",     u"5",     u"3",
@@ -195,6 +196,15 @@ TEST(XmlEscapingTest, OnePassUnescaperAgreesWithTheReference) {
       actual = u"error " + asciiText(std::to_string(error.number()));
     }
     ASSERT_EQ(actual, expected) << toUtf8(text);
+    // In place: the same text, or the same error with the text untouched.
+    Text inPlace = u"padding " + text;
+    try {
+      unescapeInPlace(inPlace);
+      ASSERT_EQ(inPlace, u"padding " + expected) << toUtf8(text);
+    } catch (const ComError& error) {
+      ASSERT_EQ(u"error " + asciiText(std::to_string(error.number())), expected);
+      ASSERT_EQ(inPlace, u"padding " + text);
+    }
   }
 }
 
