@@ -66,7 +66,30 @@ OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView retu
   return {true, false, start, close};
 }
 
-Record::Record(std::span<const FieldSpec> fields) : fields_(fields), values_(fields.size()) {}
+Record::Record(std::span<const FieldSpec> fields)
+    : fields_(fields),
+      spilled_(fields.size() > kInline ? fields.size() : 0),
+      values_(fields.size() > kInline ? spilled_.data() : inline_.data()) {}
+
+// values_ points into the record itself: a copy points into its own.
+Record::Record(const Record& other)
+    : Object(other),
+      fields_(other.fields_),
+      inline_(other.inline_),
+      spilled_(other.spilled_),
+      values_(fields_.size() > kInline ? spilled_.data() : inline_.data()) {}
+
+Record& Record::operator=(const Record& other) {
+  if (this != &other) {
+    Object::operator=(other);
+    fields_ = other.fields_;
+    inline_ = other.inline_;
+    spilled_ = other.spilled_;
+    values_ = fields_.size() > kInline ? spilled_.data() : inline_.data();
+  }
+  return *this;
+}
+
 
 Text Record::fieldValueUnescaped(size_t index) const {
   return XMLUnEscapeText(values_[index], false);

@@ -141,6 +141,8 @@ class Record : public Object {
 
  protected:
   explicit Record(std::span<const FieldSpec> fields);
+  Record(const Record& other);
+  Record& operator=(const Record& other);
 
   // Stores a value as it is, bypassing trim, check and rules.
   void storeField(size_t index, Text value) { values_[index] = std::move(value); }
@@ -154,8 +156,13 @@ class Record : public Object {
   static void addFieldMembers(Members& members, std::span<const FieldSpec> fields);
 
  private:
+  // The values of a record with few fields (a reference: most of the records a response
+  // makes) are kept in the record itself, the others in one block of their own.
+  static constexpr size_t kInline = 2;
   std::span<const FieldSpec> fields_;
-  std::vector<Text> values_;
+  std::array<Text, kInline> inline_;
+  std::vector<Text> spilled_;
+  Text* values_;  // inline_ or spilled_
 };
 
 // Typed access to a record's fields by table name: Derived::kFields is its table.
@@ -247,15 +254,9 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  const TextView name = record_.fieldSpecs()[index].name;
-  if (!isRequired) {
-    record_.setFieldValue(index,
-                          basCommonProcs::getElementValue(value_, name, start_, end_, false, {}));
-    return;
-  }
-  const Text parent = Text(parent_) + Text(parentTail_);
-  record_.setFieldValue(index,
-                        basCommonProcs::getElementValue(value_, name, start_, end_, true, parent));
+  record_.setFieldValue(index, basCommonProcs::getElementValue(
+                                   value_, record_.fieldSpecs()[index].name, start_, end_,
+                                   isRequired, parent_, parentTail_));
 }
 
 }  // namespace droqbxml

@@ -54,6 +54,11 @@ int32_t findInResponse(int32_t start, const Text& text, TextView what) {
 
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent) {
+  return getElementValue(Value, ElementName, StartPoint, EndPoint, Required, Parent, {});
+}
+
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail) {
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
@@ -97,7 +102,7 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
     StartPoint = cursor;
   }
   if (result.empty() && Required) {
-    raiseEmptyElementError(Text(Parent) + u"<" + Text(ElementName) + u">",
+    raiseEmptyElementError(Text(Parent) + Text(ParentTail) + u"<" + Text(ElementName) + u">",
                            u"DroQbXml.basCommonProcs.getElementValue");
   }
   return result;

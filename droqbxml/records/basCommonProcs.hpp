@@ -22,6 +22,9 @@ namespace droqbxml::basCommonProcs {
 // as views, so literals, texts and the records' own tables all pass without copies.
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent);
+// The same with the parent in two pieces, put together only for the error.
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail);
 
 // The first 1-based position of `what` at or after `start` in `text`, 0 when absent: the
 // platform's InStr over response text, answered from the tag index when `what` is a tag.

@@ -14,10 +14,6 @@ TextView trimView(TextView text) {
 
 Text trim(TextView text) { return Text(trimView(text)); }
 
-char16_t upperAscii(char16_t c) {
-  return (c >= u'a' && c <= u'z') ? static_cast<char16_t>(c - u'a' + u'A') : c;
-}
-
 Text upperAscii(TextView text) {
   Text out(text);
   for (auto& c : out) c = upperAscii(c);

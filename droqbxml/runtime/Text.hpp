@@ -18,7 +18,9 @@ TextView trimView(TextView text);
 Text trim(TextView text);
 
 // ASCII letters only; every other code unit is unchanged.
-char16_t upperAscii(char16_t c);
+inline char16_t upperAscii(char16_t c) {
+  return (c >= u'a' && c <= u'z') ? static_cast<char16_t>(c - u'a' + u'A') : c;
+}
 Text upperAscii(TextView text);
 Text lowerAscii(TextView text);
 bool equalsIgnoreCase(TextView a, TextView b);

@@ -32,6 +32,14 @@ TEST(DroObjRefTest, ParseReadsChildrenFromTheCursorNotFromTheTag) {
   terms.ParseRs(u"TermsRef", text, start, end);
   EXPECT_TRUE(terms.IsEmpty());
   EXPECT_EQ(end, before);
+  // A copy holds its own values (a reference keeps them inside the record).
+  DroObjRef original;
+  original.FullName(u"Kim");
+  DroObjRef copy = original;
+  original.FullName(u"Lee");
+  copy = DroObjRef(copy);
+  EXPECT_EQ(copy.FullName(), u"Kim");
+  EXPECT_EQ(original.FullName(), u"Lee");
 }
 
 // The list id of a reference is required for every kind but the item reference.

@@ -51,6 +51,15 @@ TEST(KeyedCollectionTest, RemovalKeepsKeysAndPositionsInStep) {
   col.Add(4, u"a");  // a removed key can be used again
   EXPECT_EQ((std::vector<int>(col.begin(), col.end())), (std::vector<int>{3, 4}));
   EXPECT_EQ(snapshot, (std::vector<int>{1, 2, 3}));
+
+  // A copy keeps its own keys: removing from one leaves the other whole.
+  KeyedCollection<int> copy = col;
+  col.Remove(u"C");
+  EXPECT_EQ(copy.Item(u"c"), 3);
+  copy.Remove(u"A");
+  EXPECT_EQ((std::vector<int>(copy.begin(), copy.end())), (std::vector<int>{3}));
+  EXPECT_EQ((std::vector<int>(col.begin(), col.end())), (std::vector<int>{4}));
+  EXPECT_EQ(col.Item(u"a"), 4);
 }
 
 }  // namespace

@@ -91,11 +91,12 @@ size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
   size_t at = TextView::npos;
+  // "/>" is looked for before every element read and seldom found: the index answers at once.
+  if (index_ != nullptr && pattern == TagIndex::kSelfClose) return index_->findSelfClose(from);
   if (pattern == last_ && lastAnswer_.covers(from, at)) return at;
   size_t end = std::min(text.size(), from + kNear);
   at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
-  if (index_ != nullptr && pattern == TagIndex::kSelfClose) return index_->findSelfClose(from);
   if (TagIndex::covers(pattern)) {
     if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
       // A tag not found nearby: a little further, else (it is far or absent) index the
