@@ -10,6 +10,7 @@
 // character appears.
 #include "droqbxml/qbxml/XmlEscaping.hpp"
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <cstdint>
@@ -161,8 +162,15 @@ Reference readReference(TextView text, size_t at) {
 }
 
 char16_t referenceCharacter(TextView digits, bool useUnicode) {
-  // "&#;" has no digits: the empty text does not convert (13).
-  const int32_t code = textToLong(digits);
+  // "&#;" has no digits: the empty text does not convert (13). Up to nine digits are a
+  // number in range, worked out directly; longer ones go through the conversion, for its
+  // overflow.
+  int32_t code = 0;
+  if (!digits.empty() && digits.size() <= 9) {
+    for (const char16_t digit : digits) code = code * 10 + (digit - u'0');
+  } else {
+    code = textToLong(digits);
+  }
   return useUnicode ? unicodeChar(code) : ansiChar(code);
 }
 
@@ -197,8 +205,14 @@ size_t findAmpersand(TextView text, size_t from) {
   return text.find(u'&', from);
 }
 
+constexpr bool startsAGLQ(char16_t c) { return c == u'a' || c == u'g' || c == u'l' || c == u'q'; }
+static_assert(std::all_of(basGlobals::EntityTable.begin(), basGlobals::EntityTable.end(),
+                          [](const auto& row) { return startsAGLQ(row.entity[1]); }));
+
 // The entity among the five that `rest` starts with: its length (0 for none) and character.
 size_t entityAt(TextView rest, char16_t& character) {
+  // Every entity starts "&a", "&g", "&l" or "&q": anything else is none of them.
+  if (rest.size() < 2 || !startsAGLQ(rest[1])) return 0;
   for (const auto& row : basGlobals::EntityTable) {
     if (rest.starts_with(row.entity)) {
       character = row.character;
