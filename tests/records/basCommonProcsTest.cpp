@@ -113,6 +113,14 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
       }
     }
   }
+  {
+    // A read whose first far search is "/>" has the text indexed by it.
+    const Text far = Text(20000, u'x') + u"<B/><A>x</A>";
+    const internal::SearchScope farScope(far);
+    ASSERT_EQ(internal::SearchScope::find(far, u"/>", 3), far.find(u"/>"));
+    ASSERT_EQ(internal::SearchScope::find(far, u"/>", 20003), Text::npos);
+    ASSERT_EQ(internal::SearchScope::find(far, u"<A>", 5), far.find(u"<A>"));
+  }
   EXPECT_FALSE(internal::TagIndex::covers(u"<A b=\"1\">"));
   EXPECT_FALSE(internal::TagIndex::covers(u"<B/>"));
   EXPECT_TRUE(internal::TagIndex::covers(u"<A >"));

@@ -92,22 +92,27 @@ size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
   size_t at = TextView::npos;
   // "/>" is looked for before every element read and seldom found: the index answers at once.
-  if (index_ != nullptr && pattern == TagIndex::kSelfClose) return index_->findSelfClose(from);
+  const bool selfClose = pattern == TagIndex::kSelfClose;
+  if (index_ != nullptr && selfClose) return index_->findSelfClose(from);
   if (pattern == last_ && lastAnswer_.covers(from, at)) return at;
   size_t end = std::min(text.size(), from + kNear);
   at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
-  if (TagIndex::covers(pattern)) {
+  const bool tag = TagIndex::covers(pattern);
+  if (tag || selfClose) {
     if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
-      // A tag not found nearby: a little further, else (it is far or absent) index the
-      // text for this search and the rest of the read.
+      // Not found nearby: a little further, else (it is far or absent) index the text for
+      // this search and the rest of the read. The first read of a response gets here with
+      // "/>", which a response seldom holds: the index's one pass finds that it is absent
+      // and serves every later tag as well.
       end = std::min(text.size(), from + kIndexedSize);
       at = findForward(text.substr(0, end), pattern, from);
       if (at != TextView::npos || end == text.size()) return at;
       ownIndex_ = std::make_unique<TagIndex>(text);
       index_ = ownIndex_.get();
     }
-    if (index_ != nullptr) return index_->find(pattern, from);
+    if (index_ != nullptr)
+      return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from);
   }
   if (!answers_.empty() && remembered(pattern, from, at)) return at;
   at = findForward(text, pattern, from);
