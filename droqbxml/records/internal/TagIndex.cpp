@@ -33,32 +33,67 @@ bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
   return true;
 }
 
-// Calls lt(p) for each '<' and gt(p) for each '>' of text, in the text's order.
-template <class Lt, class Gt>
-void forEachBracket(TextView text, Lt lt, Gt gt) {
+// Calls tag(p, g) for each '<' at p that may start a covered tag: the next code unit is
+// not '/', '?' or '!', and the first '<' or '>' after it is the '>' at g (a covered name
+// holds neither). Calls selfClose(q) for each "/>" at q. Both in the text's order.
+//
+// With SSE2 eight code units at a time: a block's masks tell its start-tag '<'s, and the
+// first bracket after one is found in the block's masks; a tag still open at the end of a
+// block is settled by the first bracket of a later one. End tags and the '>'s of tags cost
+// no step of their own.
+template <class Tag, class SelfClose>
+void forEachTag(TextView text, Tag tag, SelfClose selfClose) {
   const char16_t* data = text.data();
+  const size_t n = text.size();
+  size_t open = SIZE_MAX;  // a '<' whose closing bracket is still to be found
   size_t at = 0;
 #if defined(__SSE2__)
-  const __m128i open = _mm_set1_epi16(u'<');
-  const __m128i close = _mm_set1_epi16(u'>');
-  for (; at + 8 <= text.size(); at += 8) {
+  const __m128i lt = _mm_set1_epi16(u'<');
+  const __m128i gt = _mm_set1_epi16(u'>');
+  const __m128i slash = _mm_set1_epi16(u'/');
+  // Each code unit has two mask bits; the lower one of each pair is kept.
+  const auto mask = [](__m128i equal) {
+    return static_cast<unsigned>(_mm_movemask_epi8(equal)) & 0x5555u;
+  };
+  for (; at + 9 <= n; at += 8) {
     const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at));
-    const auto opens = static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi16(units, open)));
-    const auto closes = static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi16(units, close)));
-    // Two mask bits a code unit; the lower one of each pair is enough.
-    for (unsigned both = (opens | closes) & 0x5555u; both != 0; both &= both - 1) {
-      const auto bit = static_cast<unsigned>(__builtin_ctz(both));
-      if ((opens >> bit) & 1u) {
-        lt(at + bit / 2);
-      } else {
-        gt(at + bit / 2);
+    const __m128i next = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at + 1));
+    const unsigned gts = mask(_mm_cmpeq_epi16(units, gt));
+    const unsigned lts = mask(_mm_cmpeq_epi16(units, lt));
+    const unsigned brackets = lts | gts;
+    const unsigned selfCloses =
+        mask(_mm_and_si128(_mm_cmpeq_epi16(units, slash), _mm_cmpeq_epi16(next, gt)));
+    for (unsigned m = selfCloses; m != 0; m &= m - 1) selfClose(at + __builtin_ctz(m) / 2);
+    if (brackets == 0) continue;
+    if (open != SIZE_MAX) {
+      const auto first = static_cast<unsigned>(__builtin_ctz(brackets));
+      if ((gts >> first) & 1u) tag(open, at + first / 2);
+      open = SIZE_MAX;
+    }
+    for (unsigned starts = lts & ~mask(_mm_cmpeq_epi16(next, slash)); starts != 0;
+         starts &= starts - 1) {
+      const auto bit = static_cast<unsigned>(__builtin_ctz(starts));
+      const char16_t after = data[at + bit / 2 + 1];
+      if (after == u'?' || after == u'!') continue;
+      const unsigned later = brackets & ~((2u << bit) - 1u);
+      if (later == 0) {
+        open = at + bit / 2;
+      } else if (const auto first = static_cast<unsigned>(__builtin_ctz(later));
+                 (gts >> first) & 1u) {
+        tag(at + bit / 2, at + first / 2);
       }
     }
   }
 #endif
-  for (; at < text.size(); ++at) {
-    if (data[at] == u'<') lt(at);
-    if (data[at] == u'>') gt(at);
+  for (; at < n; ++at) {
+    const char16_t c = data[at];
+    if (c == u'/' && at + 1 < n && data[at + 1] == u'>') selfClose(at);
+    if (c == u'<') {
+      open = at + 1 < n && startsName(data[at + 1]) ? at : SIZE_MAX;
+    } else if (c == u'>' && open != SIZE_MAX) {
+      tag(open, at);
+      open = SIZE_MAX;
+    }
   }
 }
 
@@ -109,38 +144,21 @@ uint32_t TagIndex::findGroup(TextView name) const {
 TagIndex::TagIndex(TextView text) : text_(text) {
   slotBits_ = text.size() < 16384 ? 8 : 12;
   slots_.resize(size_t{1} << slotBits_);
-  // A start tag's name ends at the first '>' after its '<', so its group is known when that
-  // '>' is reached; '<'s still waiting for theirs are pending (more than one only in text
-  // that is not XML).
   struct Tag {
     uint32_t at;
     uint32_t group;
   };
   std::vector<Tag> tags;
   tags.reserve(text.size() / 6);  // more than XML can hold; room never used costs nothing
-  uint32_t pending = UINT32_MAX;  // the '<' waiting for its '>'
-  std::vector<uint32_t> morePending;
   const char16_t* data = text.data();
-  const auto close = [&](size_t p, size_t g) {
-    if (g - p >= 2 && endsName(data[g - 1])) {
-      tags.push_back({static_cast<uint32_t>(p), groupOf(p + 1, g - p - 1)});
-    }
-  };
-  forEachBracket(
+  forEachTag(
       text,
-      [&](size_t p) {
-        if (p + 1 < text.size() && startsName(data[p + 1])) {
-          if (pending != UINT32_MAX) morePending.push_back(pending);
-          pending = static_cast<uint32_t>(p);
+      [&](size_t p, size_t g) {
+        if (g - p >= 2 && endsName(data[g - 1])) {
+          tags.push_back({static_cast<uint32_t>(p), groupOf(p + 1, g - p - 1)});
         }
       },
-      [&](size_t g) {
-        if (g > 0 && data[g - 1] == u'/') selfCloses_.push_back(static_cast<uint32_t>(g - 1));
-        for (const uint32_t p : morePending) close(p, g);
-        morePending.clear();
-        if (pending != UINT32_MAX) close(pending, g);
-        pending = UINT32_MAX;
-      });
+      [&](size_t q) { selfCloses_.push_back(static_cast<uint32_t>(q)); });
   starts_.assign(size_t{groups_} + 1, 0);
   for (const Tag& tag : tags) ++starts_[tag.group + 1];
   for (size_t g = 1; g < starts_.size(); ++g) starts_[g] += starts_[g - 1];
