@@ -124,6 +124,15 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   EXPECT_FALSE(internal::TagIndex::covers(u"<A b=\"1\">"));
   EXPECT_FALSE(internal::TagIndex::covers(u"<B/>"));
   EXPECT_TRUE(internal::TagIndex::covers(u"<A >"));
+  // "/>" and tags at every offset of the index's blocks, across their boundaries too.
+  for (size_t k = 0; k < 40; ++k) {
+    const Text shifted = Text(k, u'x') + u"/>" + Text(k % 19, u'y') + u"<A>z</A><A>";
+    const internal::TagIndex at(shifted);
+    ASSERT_EQ(at.findSelfClose(0), shifted.find(u"/>")) << k;
+    for (size_t from = 0; from <= shifted.size(); ++from) {
+      ASSERT_EQ(at.find(u"<A>", from), shifted.find(u"<A>", from)) << k;
+    }
+  }
   // Matches at every offset near the end, where the wide comparison hands over.
   for (size_t size = 2; size < 40; ++size) {
     const Text tail = Text(size - 2, u'x') + u"<A";

@@ -1,5 +1,5 @@
-// The start-tag index: one scan for '<' and '>', each start tag given its name's group as
-// its '>' is reached, then the positions sorted by group (a counting sort, so each group
+// The start-tag index: one scan for the start tags, each given its name's group as its '>'
+// is found, then the positions sorted by group (a counting sort, so each group
 // keeps the text's order).
 #include "droqbxml/records/internal/TagIndex.hpp"
 
@@ -37,7 +37,7 @@ bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
 // not '/', '?' or '!', and the first '<' or '>' after it is the '>' at g (a covered name
 // holds neither). Calls selfClose(q) for each "/>" at q. Both in the text's order.
 //
-// With SSE2 eight code units at a time: a block's masks tell its start-tag '<'s, and the
+// With SSE2 sixteen code units at a time: a block's masks tell its start-tag '<'s, and the
 // first bracket after one is found in the block's masks; a tag still open at the end of a
 // block is settled by the first bracket of a later one. End tags and the '>'s of tags cost
 // no step of their own.
@@ -51,36 +51,47 @@ void forEachTag(TextView text, Tag tag, SelfClose selfClose) {
   const __m128i lt = _mm_set1_epi16(u'<');
   const __m128i gt = _mm_set1_epi16(u'>');
   const __m128i slash = _mm_set1_epi16(u'/');
-  // Each code unit has two mask bits; the lower one of each pair is kept.
-  const auto mask = [](__m128i equal) {
-    return static_cast<unsigned>(_mm_movemask_epi8(equal)) & 0x5555u;
+  // A bit a code unit, sixteen units a block: the comparisons of its two halves packed.
+  const auto mask = [](__m128i low, __m128i high) {
+    return static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(low, high)));
   };
-  for (; at + 9 <= n; at += 8) {
-    const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at));
-    const __m128i next = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at + 1));
-    const unsigned gts = mask(_mm_cmpeq_epi16(units, gt));
-    const unsigned lts = mask(_mm_cmpeq_epi16(units, lt));
+  const auto load = [data](size_t from) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + from));
+  };
+  for (; at + 17 <= n; at += 16) {
+    const __m128i low = load(at);
+    const __m128i high = load(at + 8);
+    const __m128i lowNext = load(at + 1);
+    const __m128i highNext = load(at + 9);
+    const unsigned gts = mask(_mm_cmpeq_epi16(low, gt), _mm_cmpeq_epi16(high, gt));
+    const unsigned lts = mask(_mm_cmpeq_epi16(low, lt), _mm_cmpeq_epi16(high, lt));
     const unsigned brackets = lts | gts;
+    if (brackets == 0) {
+      // No '>' in the block: the only "/>" can be the one its last unit starts.
+      if (data[at + 15] == u'/' && data[at + 16] == u'>') selfClose(at + 15);
+      continue;
+    }
     const unsigned selfCloses =
-        mask(_mm_and_si128(_mm_cmpeq_epi16(units, slash), _mm_cmpeq_epi16(next, gt)));
-    for (unsigned m = selfCloses; m != 0; m &= m - 1) selfClose(at + __builtin_ctz(m) / 2);
-    if (brackets == 0) continue;
+        mask(_mm_and_si128(_mm_cmpeq_epi16(low, slash), _mm_cmpeq_epi16(lowNext, gt)),
+             _mm_and_si128(_mm_cmpeq_epi16(high, slash), _mm_cmpeq_epi16(highNext, gt)));
+    for (unsigned m = selfCloses; m != 0; m &= m - 1) selfClose(at + __builtin_ctz(m));
     if (open != SIZE_MAX) {
       const auto first = static_cast<unsigned>(__builtin_ctz(brackets));
-      if ((gts >> first) & 1u) tag(open, at + first / 2);
+      if ((gts >> first) & 1u) tag(open, at + first);
       open = SIZE_MAX;
     }
-    for (unsigned starts = lts & ~mask(_mm_cmpeq_epi16(next, slash)); starts != 0;
-         starts &= starts - 1) {
+    const unsigned endTags =
+        mask(_mm_cmpeq_epi16(lowNext, slash), _mm_cmpeq_epi16(highNext, slash));
+    for (unsigned starts = lts & ~endTags; starts != 0; starts &= starts - 1) {
       const auto bit = static_cast<unsigned>(__builtin_ctz(starts));
-      const char16_t after = data[at + bit / 2 + 1];
+      const char16_t after = data[at + bit + 1];
       if (after == u'?' || after == u'!') continue;
       const unsigned later = brackets & ~((2u << bit) - 1u);
       if (later == 0) {
-        open = at + bit / 2;
+        open = at + bit;
       } else if (const auto first = static_cast<unsigned>(__builtin_ctz(later));
                  (gts >> first) & 1u) {
-        tag(at + bit / 2, at + first / 2);
+        tag(at + bit, at + first);
       }
     }
   }

@@ -1,10 +1,10 @@
 // Where each start tag of a response text stands, grouped by the tag's exact text, so that
 // searching a long response for "<Name>" is a lookup and a binary search. Built in one pass
-// over the text: every '<' and '>' is found eight code units at a time, and a start tag
-// joins its group by a short key (its length and the code units at its ends) checked
-// against the group's first tag; tags whose keys collide are told apart by their whole
-// text. Start tags with attributes or self-closed are left out: searches for them, like
-// any other search, go over the text.
+// over the text, sixteen code units at a time, in which each start tag joins its group by
+// a short key (its length and the code units at its ends) checked against the group's
+// first tag; tags whose keys collide are told apart by their whole text. Start tags with
+// attributes or self-closed are left out: searches for them, like any other search, go
+// over the text.
 #ifndef DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
 #define DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
 
