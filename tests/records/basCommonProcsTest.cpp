@@ -90,6 +90,7 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   while (text.size() < 100000) text += pieces[random() % std::size(pieces)];
   const Text other = text.substr(1);
   const internal::TagIndex index(text);
+  const internal::TagIndex narrow(text, false);  // SSE2 only, where the first may use AVX2
   // Inside a read's scope too (which indexes the text once its searches have gone far), with
   // cursors that go back as well as forward, and for a text the scope is not over.
   const internal::SearchScope scope(text);
@@ -105,11 +106,13 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
           << round << " " << toUtf8(Text(pattern));
       ASSERT_EQ(internal::SearchScope::find(text, pattern, from), expected);
       ASSERT_EQ(internal::SearchScope::find(other, pattern, from), other.find(pattern, from));
-      if (internal::TagIndex::covers(pattern) && from <= text.size()) {
-        ASSERT_EQ(index.find(pattern, from), expected) << toUtf8(Text(pattern));
-      }
-      if (pattern == internal::TagIndex::kSelfClose) {
-        ASSERT_EQ(index.findSelfClose(from), expected);
+      for (const internal::TagIndex* scan : {&index, &narrow}) {
+        if (internal::TagIndex::covers(pattern) && from <= text.size()) {
+          ASSERT_EQ(scan->find(pattern, from), expected) << toUtf8(Text(pattern));
+        }
+        if (pattern == internal::TagIndex::kSelfClose) {
+          ASSERT_EQ(scan->findSelfClose(from), expected);
+        }
       }
     }
   }
@@ -125,12 +128,14 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   EXPECT_FALSE(internal::TagIndex::covers(u"<B/>"));
   EXPECT_TRUE(internal::TagIndex::covers(u"<A >"));
   // "/>" and tags at every offset of the index's blocks, across their boundaries too.
-  for (size_t k = 0; k < 40; ++k) {
-    const Text shifted = Text(k, u'x') + u"/>" + Text(k % 19, u'y') + u"<A>z</A><A>";
-    const internal::TagIndex at(shifted);
-    ASSERT_EQ(at.findSelfClose(0), shifted.find(u"/>")) << k;
-    for (size_t from = 0; from <= shifted.size(); ++from) {
-      ASSERT_EQ(at.find(u"<A>", from), shifted.find(u"<A>", from)) << k;
+  for (size_t k = 0; k < 80; ++k) {
+    const Text shifted = Text(k, u'x') + u"/>" + Text(k % 37, u'y') + u"<A>z</A><A>";
+    for (const bool wide : {true, false}) {
+      const internal::TagIndex at(shifted, wide);
+      ASSERT_EQ(at.findSelfClose(0), shifted.find(u"/>")) << k;
+      for (size_t from = 0; from <= shifted.size(); ++from) {
+        ASSERT_EQ(at.find(u"<A>", from), shifted.find(u"<A>", from)) << k;
+      }
     }
   }
   // Matches at every offset near the end, where the wide comparison hands over.

@@ -9,6 +9,13 @@
 #if defined(__SSE2__)
 #include <emmintrin.h>
 #endif
+// The wide scan: x86-64 Linux with GCC or clang, chosen when the processor runs.
+#if defined(__x86_64__) && defined(__linux__) && defined(__GNUC__)
+#define DROQBXML_TAG_SCAN_AVX2 1
+#include <immintrin.h>
+#else
+#define DROQBXML_TAG_SCAN_AVX2 0
+#endif
 
 namespace droqbxml::internal {
 namespace {
@@ -33,69 +40,97 @@ bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
   return true;
 }
 
+// The scan's block loop, once for each instruction set: `Block` holds a block's code units
+// and those one further on, and gives masks of a bit a unit.
+#if defined(__SSE2__)
+namespace sse2 {
+struct Block {
+  static constexpr size_t kWidth = 16;
+  explicit Block(const char16_t* at)
+      : low(load(at)), high(load(at + 8)), lowNext(load(at + 1)), highNext(load(at + 9)) {}
+  static __m128i load(const char16_t* at) {
+    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(at));
+  }
+  static unsigned mask(__m128i low, __m128i high) {
+    return static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(low, high)));
+  }
+  static __m128i equal(__m128i units, char16_t c) {
+    return _mm_cmpeq_epi16(units, _mm_set1_epi16(static_cast<int16_t>(c)));
+  }
+  unsigned is(char16_t c) const { return mask(equal(low, c), equal(high, c)); }
+  unsigned nextIs(char16_t c) const { return mask(equal(lowNext, c), equal(highNext, c)); }
+  unsigned isThenNextIs(char16_t c, char16_t then) const {
+    return mask(_mm_and_si128(equal(low, c), equal(lowNext, then)),
+                _mm_and_si128(equal(high, c), equal(highNext, then)));
+  }
+  __m128i low, high, lowNext, highNext;
+};
+#include "droqbxml/records/internal/TagScanLoop.inc"
+}  // namespace sse2
+#endif
+
+// With AVX2 (when the processor has it) thirty-two units a block.
+#if DROQBXML_TAG_SCAN_AVX2
+#if defined(__clang__)
+#pragma clang attribute push(__attribute__((target("avx2"))), apply_to = function)
+#else
+#pragma GCC push_options
+#pragma GCC target("avx2")
+#endif
+namespace avx2 {
+struct Block {
+  static constexpr size_t kWidth = 32;
+  explicit Block(const char16_t* at)
+      : low(load(at)), high(load(at + 16)), lowNext(load(at + 1)), highNext(load(at + 17)) {}
+  static __m256i load(const char16_t* at) {
+    return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(at));
+  }
+  static unsigned mask(__m256i low, __m256i high) {
+    // The pack interleaves the halves' 128-bit lanes; the permutation puts them in order.
+    return static_cast<unsigned>(
+        _mm256_movemask_epi8(_mm256_permute4x64_epi64(_mm256_packs_epi16(low, high), 0xD8)));
+  }
+  static __m256i equal(__m256i units, char16_t c) {
+    return _mm256_cmpeq_epi16(units, _mm256_set1_epi16(static_cast<int16_t>(c)));
+  }
+  unsigned is(char16_t c) const { return mask(equal(low, c), equal(high, c)); }
+  unsigned nextIs(char16_t c) const { return mask(equal(lowNext, c), equal(highNext, c)); }
+  unsigned isThenNextIs(char16_t c, char16_t then) const {
+    return mask(_mm256_and_si256(equal(low, c), equal(lowNext, then)),
+                _mm256_and_si256(equal(high, c), equal(highNext, then)));
+  }
+  __m256i low, high, lowNext, highNext;
+};
+#include "droqbxml/records/internal/TagScanLoop.inc"
+}  // namespace avx2
+#if defined(__clang__)
+#pragma clang attribute pop
+#else
+#pragma GCC pop_options
+#endif
+#endif
+
 // Calls tag(p, g) for each '<' at p that may start a covered tag: the next code unit is
 // not '/', '?' or '!', and the first '<' or '>' after it is the '>' at g (a covered name
-// holds neither). Calls selfClose(q) for each "/>" at q. Both in the text's order.
-//
-// With SSE2 sixteen code units at a time: a block's masks tell its start-tag '<'s, and the
-// first bracket after one is found in the block's masks; a tag still open at the end of a
-// block is settled by the first bracket of a later one. End tags and the '>'s of tags cost
-// no step of their own.
+// holds neither). Calls selfClose(q) for each "/>" at q. Both in the text's order. `wide`
+// lets the scan use AVX2 where the processor has it.
 template <class Tag, class SelfClose>
-void forEachTag(TextView text, Tag tag, SelfClose selfClose) {
+void forEachTag(TextView text, bool wide, Tag tag, SelfClose selfClose) {
   const char16_t* data = text.data();
   const size_t n = text.size();
   size_t open = SIZE_MAX;  // a '<' whose closing bracket is still to be found
   size_t at = 0;
-#if defined(__SSE2__)
-  const __m128i lt = _mm_set1_epi16(u'<');
-  const __m128i gt = _mm_set1_epi16(u'>');
-  const __m128i slash = _mm_set1_epi16(u'/');
-  // A bit a code unit, sixteen units a block: the comparisons of its two halves packed.
-  const auto mask = [](__m128i low, __m128i high) {
-    return static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(low, high)));
-  };
-  const auto load = [data](size_t from) {
-    return _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + from));
-  };
-  for (; at + 17 <= n; at += 16) {
-    const __m128i low = load(at);
-    const __m128i high = load(at + 8);
-    const __m128i lowNext = load(at + 1);
-    const __m128i highNext = load(at + 9);
-    const unsigned gts = mask(_mm_cmpeq_epi16(low, gt), _mm_cmpeq_epi16(high, gt));
-    const unsigned lts = mask(_mm_cmpeq_epi16(low, lt), _mm_cmpeq_epi16(high, lt));
-    const unsigned brackets = lts | gts;
-    if (brackets == 0) {
-      // No '>' in the block: the only "/>" can be the one its last unit starts.
-      if (data[at + 15] == u'/' && data[at + 16] == u'>') selfClose(at + 15);
-      continue;
-    }
-    const unsigned selfCloses =
-        mask(_mm_and_si128(_mm_cmpeq_epi16(low, slash), _mm_cmpeq_epi16(lowNext, gt)),
-             _mm_and_si128(_mm_cmpeq_epi16(high, slash), _mm_cmpeq_epi16(highNext, gt)));
-    for (unsigned m = selfCloses; m != 0; m &= m - 1) selfClose(at + __builtin_ctz(m));
-    if (open != SIZE_MAX) {
-      const auto first = static_cast<unsigned>(__builtin_ctz(brackets));
-      if ((gts >> first) & 1u) tag(open, at + first);
-      open = SIZE_MAX;
-    }
-    const unsigned endTags =
-        mask(_mm_cmpeq_epi16(lowNext, slash), _mm_cmpeq_epi16(highNext, slash));
-    for (unsigned starts = lts & ~endTags; starts != 0; starts &= starts - 1) {
-      const auto bit = static_cast<unsigned>(__builtin_ctz(starts));
-      const char16_t after = data[at + bit + 1];
-      if (after == u'?' || after == u'!') continue;
-      const unsigned later = brackets & ~((2u << bit) - 1u);
-      if (later == 0) {
-        open = at + bit;
-      } else if (const auto first = static_cast<unsigned>(__builtin_ctz(later));
-                 (gts >> first) & 1u) {
-        tag(at + bit, at + first);
-      }
-    }
-  }
+#if DROQBXML_TAG_SCAN_AVX2
+  if (wide && __builtin_cpu_supports("avx2")) {
+    at = avx2::scanBlocks(data, n, open, tag, selfClose);
+  } else
 #endif
+  {
+#if defined(__SSE2__)
+    at = sse2::scanBlocks(data, n, open, tag, selfClose);
+#endif
+  }
+  static_cast<void>(wide);
   for (; at < n; ++at) {
     const char16_t c = data[at];
     if (c == u'/' && at + 1 < n && data[at + 1] == u'>') selfClose(at);
@@ -152,7 +187,7 @@ uint32_t TagIndex::findGroup(TextView name) const {
   return known == others_.end() ? UINT32_MAX : known->second;
 }
 
-TagIndex::TagIndex(TextView text) : text_(text) {
+TagIndex::TagIndex(TextView text, bool wide) : text_(text) {
   slotBits_ = text.size() < 16384 ? 8 : 12;
   slots_.resize(size_t{1} << slotBits_);
   struct Tag {
@@ -163,7 +198,7 @@ TagIndex::TagIndex(TextView text) : text_(text) {
   tags.reserve(text.size() / 6);  // more than XML can hold; room never used costs nothing
   const char16_t* data = text.data();
   forEachTag(
-      text,
+      text, wide,
       [&](size_t p, size_t g) {
         if (g - p >= 2 && endsName(data[g - 1])) {
           tags.push_back({static_cast<uint32_t>(p), groupOf(p + 1, g - p - 1)});

@@ -21,8 +21,9 @@ namespace droqbxml::internal {
 class TagIndex {
  public:
   // Indexes `text` (at most UINT32_MAX code units), which must outlive the index and not
-  // change: the index answers for that text only.
-  explicit TagIndex(TextView text);
+  // change: the index answers for that text only. Without `wide` the scan keeps to SSE2
+  // even where the processor has AVX2 (the tests compare both).
+  explicit TagIndex(TextView text, bool wide = true);
 
   // Whether the index answers searches for `pattern`: "<" + name + ">" where the name is
   // not empty, holds no '<' or '>', does not start with '/', '?' or '!' and does not end
