@@ -24,22 +24,22 @@ const ClassInfo& DroTypedRef<Kind>::typeInfo() {
 
 template <RefKind Kind>
 void DroTypedRef<Kind>::ListID(const Text& value) {
-  inner_->ListID(trim(value));
+  inner_.ListID(trim(value));
 }
 
 template <RefKind Kind>
 void DroTypedRef<Kind>::FullName(const Text& value) {
   const Text given = kSpec.trimsFullName ? trim(value) : value;
-  inner_->FullName(basValidations::CheckSTRTYPE(given, kSpec.fullNameMaxLength, false));
+  inner_.FullName(basValidations::CheckSTRTYPE(given, kSpec.fullNameMaxLength, false));
 }
 
 template <RefKind Kind>
 void DroTypedRef<Kind>::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint,
                                 int32_t& EndPoint, bool Required, const Text& Parent) {
   if constexpr (kSpec.passesRequired) {
-    inner_->ParseRs(RefName, Value, StartPoint, EndPoint, Required, Parent);
+    inner_.ParseRs(RefName, Value, StartPoint, EndPoint, Required, Parent);
   } else {
-    inner_->ParseRs(RefName, Value, StartPoint, EndPoint, false, u"");
+    inner_.ParseRs(RefName, Value, StartPoint, EndPoint, false, u"");
   }
 }
 

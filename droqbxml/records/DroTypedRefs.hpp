@@ -72,21 +72,21 @@ class DroTypedRef final : public Object {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const Text& ListID() const { return inner_->ListID(); }
+  const Text& ListID() const { return inner_.ListID(); }
   // Trimmed, then stored in the inner reference.
   void ListID(const Text& value);
-  const Text& FullName() const { return inner_->FullName(); }
+  const Text& FullName() const { return inner_.FullName(); }
   // Trimmed (except for DroIncomeAccountRef), refused when longer than the kind's limit.
   void FullName(const Text& value);
-  bool IsEmpty() const { return inner_->IsEmpty(); }
+  bool IsEmpty() const { return inner_.IsEmpty(); }
   // The inner ParseRs; Required and Parent reach it only for DroClassRef, every other kind
   // passes false and "" so that a missing ListID never raises.
   void ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
                bool Required = false, const Text& Parent = u"");
-  Text PrintOut() const { return inner_->PrintOut(); }
+  Text PrintOut() const { return inner_.PrintOut(); }
 
  private:
-  Ref<DroObjRef> inner_ = std::make_shared<DroObjRef>();
+  DroObjRef inner_;  // held by value: one allocation a reference, not two
 };
 
 using DroAccountRef = DroTypedRef<RefKind::Account>;
