@@ -37,7 +37,7 @@ void DroAddress::CopyAddress(const Ref<DroAddress>& oAddress) {
   State(oAddress->State());
 }
 
-void DroAddress::ParseRs(const Text& AddressName, const Text& Value, int32_t& StartPoint,
+void DroAddress::ParseRs(TextView AddressName, const Text& Value, int32_t& StartPoint,
                          int32_t& EndPoint) {
   if (StartPoint == 0) StartPoint = EndPoint == 0 ? 1 : EndPoint;
   thread_local Text tag;  // "<AddressName>", made without allocating on most calls

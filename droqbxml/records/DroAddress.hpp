@@ -55,7 +55,7 @@ class DroAddress final : public RecordOf<DroAddress> {
   void CopyAddress(const Ref<DroAddress>& oAddress);
   // Finds "<AddressName>" from StartPoint (0 is read as EndPoint, then 1); when present,
   // reads the seven fields from the cursor EndPoint. Absent: StartPoint becomes 0.
-  void ParseRs(const Text& AddressName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint);
+  void ParseRs(TextView AddressName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint);
   Text PrintOut() const;
 
  private:

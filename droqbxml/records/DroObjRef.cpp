@@ -20,8 +20,8 @@ const ClassInfo& DroObjRef::typeInfo() {
 
 void DroObjRef::fieldStored(size_t) { hasData_ = !ListID().empty() || !FullName().empty(); }
 
-void DroObjRef::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint,
-                        int32_t& EndPoint, bool Required, const Text& Parent) {
+void DroObjRef::ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
+                        bool Required, TextView Parent) {
   thread_local Text tag;  // "<RefName>", made without allocating on most calls
   tag.assign(u"<").append(RefName).push_back(u'>');
   if (basCommonProcs::findInResponse(EndPoint, Value, tag) == 0) return;

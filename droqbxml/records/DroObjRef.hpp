@@ -30,8 +30,8 @@ class DroObjRef final : public RecordOf<DroObjRef> {
   // When "<RefName>" occurs at or after the cursor, reads "ListID" and then "FullName"
   // from the cursor (not from that tag; the end tag is never looked for, so a reference
   // without FullName takes the next one in the text). Otherwise nothing changes.
-  void ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
-               bool Required = false, const Text& Parent = u"");
+  void ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
+               bool Required = false, TextView Parent = {});
   Text PrintOut() const;
 
  private:

@@ -34,12 +34,12 @@ void DroTypedRef<Kind>::FullName(const Text& value) {
 }
 
 template <RefKind Kind>
-void DroTypedRef<Kind>::ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint,
-                                int32_t& EndPoint, bool Required, const Text& Parent) {
+void DroTypedRef<Kind>::ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint,
+                                int32_t& EndPoint, bool Required, TextView Parent) {
   if constexpr (kSpec.passesRequired) {
     inner_.ParseRs(RefName, Value, StartPoint, EndPoint, Required, Parent);
   } else {
-    inner_.ParseRs(RefName, Value, StartPoint, EndPoint, false, u"");
+    inner_.ParseRs(RefName, Value, StartPoint, EndPoint, false, {});
   }
 }
 

@@ -81,8 +81,8 @@ class DroTypedRef final : public Object {
   bool IsEmpty() const { return inner_.IsEmpty(); }
   // The inner ParseRs; Required and Parent reach it only for DroClassRef, every other kind
   // passes false and "" so that a missing ListID never raises.
-  void ParseRs(const Text& RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
-               bool Required = false, const Text& Parent = u"");
+  void ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
+               bool Required = false, TextView Parent = {});
   Text PrintOut() const { return inner_.PrintOut(); }
 
  private:

@@ -26,6 +26,12 @@ struct IsRef<Ref<T>> : std::true_type {
   using Element = T;
 };
 
+// What an argument of type T is held in while a late-bound call runs: a text parameter
+// taken as a view is given a text of its own.
+template <class T>
+using Held = std::conditional_t<std::is_same_v<std::remove_cvref_t<T>, TextView>, Text,
+                                std::remove_cvref_t<T>>;
+
 template <class T>
 T fromVariant(const Variant& v) {
   if constexpr (std::is_same_v<T, Variant>) {
@@ -67,7 +73,7 @@ constexpr ValueType valueTypeOf() {
   using U = std::remove_cvref_t<T>;
   if constexpr (std::is_void_v<U>) {
     return ValueType::None;
-  } else if constexpr (std::is_same_v<U, Text>) {
+  } else if constexpr (std::is_same_v<U, Text> || std::is_same_v<U, TextView>) {
     return ValueType::Text;
   } else if constexpr (std::is_same_v<U, bool>) {
     return ValueType::Boolean;
@@ -101,8 +107,8 @@ Shape shapeOf() {
 template <class R, class... A, class F, size_t... I>
 Variant callWith(F&& f, Arguments args, std::index_sequence<I...>) {
   if (args.size() > sizeof...(A)) wrongArgumentCount();
-  std::tuple<std::remove_cvref_t<A>...> locals{
-      fromVariant<std::remove_cvref_t<A>>(I < args.size() ? args[I] : Variant::missing())...};
+  std::tuple<Held<A>...> locals{
+      fromVariant<Held<A>>(I < args.size() ? args[I] : Variant::missing())...};
   auto writeBack = [&] {
     (
         [&] {
