@@ -341,6 +341,20 @@ Text currencyToText(int64_t units) {
 }
 
 Text formatFixed(TextView text, int decimals) {
+  // Most texts are already digits, ".", and `decimals` decimals (amounts as QuickBooks
+  // writes them): with at most fifteen digits the number's fifteen-digit form is those
+  // digits, so the pattern is the text without the integer part's leading zeros.
+  if (decimals > 0 && text.size() > static_cast<size_t>(decimals) + 1 && text.size() <= 16) {
+    const size_t point = text.size() - static_cast<size_t>(decimals) - 1;
+    bool plain = text[point] == u'.';
+    for (size_t i = 0; plain && i < text.size(); ++i) {
+      plain = i == point || (text[i] >= u'0' && text[i] <= u'9');
+    }
+    if (plain) {
+      const size_t zeros = text.substr(0, point).find_first_not_of(u'0');
+      return Text(text.substr(zeros == TextView::npos ? point : zeros));
+    }
+  }
   const auto d = parseDecimal(text);
   if (!d) return Text(text);
   return formatFixed(decimalToDouble(*d), decimals);

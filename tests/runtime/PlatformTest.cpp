@@ -1,9 +1,12 @@
-// Path mapping, file errors and the fixed clock (the code page and date formats:
-// testdata/calls/runtime_conversions.txt).
+// Path mapping, file errors, the fixed clock, and the short way of formatting amounts (the
+// code page, date and number formats: testdata/calls/runtime_conversions.txt).
 #include <gtest/gtest.h>
+
+#include <random>
 
 #include "droqbxml/runtime/Clock.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
+#include "droqbxml/runtime/Numbers.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -58,6 +61,21 @@ TEST(ClockTest, TheFixedClock) {
     EXPECT_EQ(now(), (LocalTime{2001, 2, 3, 4, 5, 6}));
   }
   EXPECT_NE(now().year, 2001);
+}
+
+// Texts of digits with the pattern's decimals are formatted without the trip through a
+// Double: the same as with it.
+TEST(NumbersTest, PlainAmountsFormatAsThroughADouble) {
+  std::mt19937 random(11);
+  for (int round = 0; round < 20000; ++round) {
+    const int decimals = round % 2 == 0 ? 2 : 5;
+    Text text;
+    for (auto digits = random() % 16; digits > 0; --digits) text += char16_t(u'0' + random() % 10);
+    text += u'.';
+    for (int k = 0; k < decimals; ++k) text += char16_t(u'0' + random() % 10);
+    ASSERT_EQ(formatFixed(text, decimals), formatFixed(textToDouble(text), decimals))
+        << toUtf8(text);
+  }
 }
 
 }  // namespace

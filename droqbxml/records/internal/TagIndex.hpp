@@ -30,8 +30,12 @@ class TagIndex {
   // with a quote or '/'.
   static bool covers(TextView pattern);
 
-  // For a covered pattern: exactly text.find(pattern, from) of the indexed text.
+  // For a covered pattern: exactly text.find(pattern, from) of the indexed text; whether
+  // the text holds it anywhere.
   size_t find(TextView pattern, size_t from) const;
+  bool holds(TextView pattern) const {
+    return findGroup(pattern.substr(1, pattern.size() - 2)) != UINT32_MAX;
+  }
 
   // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).
   static constexpr TextView kSelfClose = u"/>";

@@ -94,11 +94,14 @@ size_t SearchScope::search(TextView pattern, size_t from) {
   // "/>" is looked for before every element read and seldom found: the index answers at once.
   const bool selfClose = pattern == TagIndex::kSelfClose;
   if (index_ != nullptr && selfClose) return index_->findSelfClose(from);
+  const bool tag = TagIndex::covers(pattern);
+  // Most elements a record asks for are absent from the whole response: the index says so
+  // without a look at the text.
+  if (index_ != nullptr && tag && !index_->holds(pattern)) return TextView::npos;
   if (pattern == last_ && lastAnswer_.covers(from, at)) return at;
   size_t end = std::min(text.size(), from + kNear);
   at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
-  const bool tag = TagIndex::covers(pattern);
   if (tag || selfClose) {
     if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
       // Not found nearby: a little further, else (it is far or absent) index the text for
