@@ -105,11 +105,17 @@ void Record::setFieldValue(size_t index, Text value) {
     const TextView kept = trimView(value);
     if (kept.size() != value.size()) value = Text(kept);
   }
-  Text result = checked(row, std::move(value));
+  // The checks that can only give the value back are skipped: most fields read from a
+  // response are texts within their length.
+  const bool unchanged =
+      row.check == Check::None || row.check == Check::DateTime || row.check == Check::Id ||
+      ((row.check == Check::Str || row.check == Check::StrCut) &&
+       (row.arg < 1 || value.size() <= static_cast<size_t>(row.arg)));
+  if (!unchanged) value = checked(row, std::move(value));
   if (row.rule == Rule::Specific) {
-    applyRule(index, result);
+    applyRule(index, value);
   } else {
-    values_[index] = std::move(result);
+    values_[index] = std::move(value);
   }
   fieldStored(index);
 }
