@@ -91,6 +91,7 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   const Text other = text.substr(1);
   const internal::TagIndex index(text);
   const internal::TagIndex narrow(text, false);  // SSE2 only, where the first may use AVX2
+  std::vector<uint32_t> hints;                    // notes of the searches made with them
   // Inside a read's scope too (which indexes the text once its searches have gone far), with
   // cursors that go back as well as forward, and for a text the scope is not over.
   const internal::SearchScope scope(text);
@@ -108,7 +109,8 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
       ASSERT_EQ(internal::SearchScope::find(other, pattern, from), other.find(pattern, from));
       for (const internal::TagIndex* scan : {&index, &narrow}) {
         if (internal::TagIndex::covers(pattern) && from <= text.size()) {
-          ASSERT_EQ(scan->find(pattern, from), expected) << toUtf8(Text(pattern));
+          ASSERT_EQ(scan->find(pattern, from, scan == &narrow ? &hints : nullptr), expected)
+              << toUtf8(Text(pattern));
         }
         if (pattern == internal::TagIndex::kSelfClose) {
           ASSERT_EQ(scan->findSelfClose(from), expected);

@@ -213,11 +213,31 @@ TagIndex::TagIndex(TextView text, bool wide) : text_(text) {
   for (const Tag& tag : tags) at_[next[tag.group]++] = tag.at;
 }
 
-size_t TagIndex::find(TextView pattern, size_t from) const {
+size_t TagIndex::find(TextView pattern, size_t from, std::vector<uint32_t>* hints) const {
   const uint32_t group = findGroup(pattern.substr(1, pattern.size() - 2));
   if (group == UINT32_MAX) return TextView::npos;
+  uint32_t* hint = nullptr;
+  if (hints != nullptr) {
+    if (hints->size() < groups_) hints->resize(groups_, UINT32_MAX);
+    hint = &(*hints)[group];
+  }
+  const auto begin = at_.begin() + starts_[group];
   const auto end = at_.begin() + starts_[group + 1];
-  const auto found = std::lower_bound(at_.begin() + starts_[group], end, from);
+  auto found = end;
+  if (hint == nullptr || *hint < starts_[group] || *hint > starts_[group + 1]) {
+    found = std::lower_bound(begin, end, from);
+  } else if (auto low = at_.begin() + *hint; low > begin && *(low - 1) >= from) {
+    found = std::lower_bound(begin, low, from);  // before the last answer
+  } else {
+    // From the last answer on, in steps that double, then a binary search in the last.
+    auto high = low;
+    for (ptrdiff_t step = 1; high != end && *high < from; step *= 2) {
+      low = high + 1;
+      high = end - low > step ? low + step : end;
+    }
+    found = std::lower_bound(low, high, from);
+  }
+  if (hint != nullptr) *hint = static_cast<uint32_t>(found - at_.begin());
   return found == end ? TextView::npos : *found;
 }
 

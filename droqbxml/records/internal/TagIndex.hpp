@@ -31,8 +31,10 @@ class TagIndex {
   static bool covers(TextView pattern);
 
   // For a covered pattern: exactly text.find(pattern, from) of the indexed text; whether
-  // the text holds it anywhere.
-  size_t find(TextView pattern, size_t from) const;
+  // the text holds it anywhere. `hints`, when given, are the caller's notes of where its
+  // last search for each tag ended (empty at first; the search keeps them): a search from
+  // further on then costs what the distance does, not the tag's count.
+  size_t find(TextView pattern, size_t from, std::vector<uint32_t>* hints = nullptr) const;
   bool holds(TextView pattern) const {
     return findGroup(pattern.substr(1, pattern.size() - 2)) != UINT32_MAX;
   }

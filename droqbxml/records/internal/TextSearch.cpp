@@ -115,7 +115,7 @@ size_t SearchScope::search(TextView pattern, size_t from) {
       index_ = ownIndex_.get();
     }
     if (index_ != nullptr)
-      return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from);
+      return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from, &hints_);
   }
   if (!answers_.empty() && remembered(pattern, from, at)) return at;
   at = findForward(text, pattern, from);

@@ -14,9 +14,11 @@
 #define DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 
 #include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <unordered_map>
+#include <vector>
 
 #include "droqbxml/runtime/Text.hpp"
 
@@ -61,6 +63,7 @@ class SearchScope {
   const TagIndex* index_ = nullptr;
   std::unique_ptr<TagIndex> ownIndex_;
   std::unordered_map<Text, Answer, Hash, std::equal_to<>> answers_;
+  std::vector<uint32_t> hints_;  // the index's notes of this read's searches
   Text last_;  // the pattern of the answer last remembered or recalled, checked first
   Answer lastAnswer_{TextView::npos, 0};  // answers nothing
 };
