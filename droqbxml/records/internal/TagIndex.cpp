@@ -40,30 +40,24 @@ bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
   return true;
 }
 
-// The scan's block loop, once for each instruction set: `Block` holds a block's code units
-// and those one further on, and gives masks of a bit a unit.
+// The scan's block loop, once for each instruction set (TagScanLoop.inc): `Units` gives
+// that set's vector of code units, how to load and compare one, and the mask of a bit a
+// unit of two comparisons.
 #if defined(__SSE2__)
 namespace sse2 {
-struct Block {
-  static constexpr size_t kWidth = 16;
-  explicit Block(const char16_t* at)
-      : low(load(at)), high(load(at + 8)), lowNext(load(at + 1)), highNext(load(at + 9)) {}
-  static __m128i load(const char16_t* at) {
+struct Units {
+  using Vector = __m128i;
+  static constexpr size_t kCount = 8;
+  static Vector load(const char16_t* at) {
     return _mm_loadu_si128(reinterpret_cast<const __m128i*>(at));
   }
-  static unsigned mask(__m128i low, __m128i high) {
-    return static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(low, high)));
-  }
-  static __m128i equal(__m128i units, char16_t c) {
+  static Vector equal(Vector units, char16_t c) {
     return _mm_cmpeq_epi16(units, _mm_set1_epi16(static_cast<int16_t>(c)));
   }
-  unsigned is(char16_t c) const { return mask(equal(low, c), equal(high, c)); }
-  unsigned nextIs(char16_t c) const { return mask(equal(lowNext, c), equal(highNext, c)); }
-  unsigned isThenNextIs(char16_t c, char16_t then) const {
-    return mask(_mm_and_si128(equal(low, c), equal(lowNext, then)),
-                _mm_and_si128(equal(high, c), equal(highNext, then)));
+  static Vector both(Vector a, Vector b) { return _mm_and_si128(a, b); }
+  static unsigned mask(Vector low, Vector high) {
+    return static_cast<unsigned>(_mm_movemask_epi8(_mm_packs_epi16(low, high)));
   }
-  __m128i low, high, lowNext, highNext;
 };
 #include "droqbxml/records/internal/TagScanLoop.inc"
 }  // namespace sse2
@@ -78,28 +72,21 @@ struct Block {
 #pragma GCC target("avx2")
 #endif
 namespace avx2 {
-struct Block {
-  static constexpr size_t kWidth = 32;
-  explicit Block(const char16_t* at)
-      : low(load(at)), high(load(at + 16)), lowNext(load(at + 1)), highNext(load(at + 17)) {}
-  static __m256i load(const char16_t* at) {
+struct Units {
+  using Vector = __m256i;
+  static constexpr size_t kCount = 16;
+  static Vector load(const char16_t* at) {
     return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(at));
   }
-  static unsigned mask(__m256i low, __m256i high) {
+  static Vector equal(Vector units, char16_t c) {
+    return _mm256_cmpeq_epi16(units, _mm256_set1_epi16(static_cast<int16_t>(c)));
+  }
+  static Vector both(Vector a, Vector b) { return _mm256_and_si256(a, b); }
+  static unsigned mask(Vector low, Vector high) {
     // The pack interleaves the halves' 128-bit lanes; the permutation puts them in order.
     return static_cast<unsigned>(
         _mm256_movemask_epi8(_mm256_permute4x64_epi64(_mm256_packs_epi16(low, high), 0xD8)));
   }
-  static __m256i equal(__m256i units, char16_t c) {
-    return _mm256_cmpeq_epi16(units, _mm256_set1_epi16(static_cast<int16_t>(c)));
-  }
-  unsigned is(char16_t c) const { return mask(equal(low, c), equal(high, c)); }
-  unsigned nextIs(char16_t c) const { return mask(equal(lowNext, c), equal(highNext, c)); }
-  unsigned isThenNextIs(char16_t c, char16_t then) const {
-    return mask(_mm256_and_si256(equal(low, c), equal(lowNext, then)),
-                _mm256_and_si256(equal(high, c), equal(highNext, then)));
-  }
-  __m256i low, high, lowNext, highNext;
 };
 #include "droqbxml/records/internal/TagScanLoop.inc"
 }  // namespace avx2
