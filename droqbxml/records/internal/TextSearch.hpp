@@ -7,9 +7,11 @@
 // Within one read (a SearchScope, open while one top-level ParseRs runs on one text that
 // nothing can change meanwhile) more is allowed: a search that runs far is remembered per
 // pattern, so an element absent from the rest of the text is searched to the end once, not
-// once per line of a long transaction; and the first start tag searched for far into a long
-// text has the read index the text's start tags (TagIndex) and look tags up there. A read
-// over an IndexedResponse uses the response's own index from the start.
+// once per line of a long transaction; and the first start tag (or "/>") searched for far
+// into a long text has the read index the text's start tags (TagIndex) and look tags up
+// there, a tag the text never holds at once and the others from where the read's last
+// search for them ended. A read over an IndexedResponse uses the response's own index from
+// the start.
 #ifndef DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 #define DROQBXML_RECORDS_INTERNAL_TEXTSEARCH_HPP_
 
