@@ -27,13 +27,7 @@ struct FoldedKeyHash {
 };
 struct FoldedKeyEqual {
   using is_transparent = void;
-  bool operator()(TextView a, TextView b) const noexcept {
-    if (a.size() != b.size()) return false;
-    for (size_t i = 0; i < a.size(); ++i) {
-      if (a[i] != b[i] && upperAscii(a[i]) != upperAscii(b[i])) return false;
-    }
-    return true;
-  }
+  bool operator()(TextView a, TextView b) const { return equalsIgnoreCase(a, b); }
 };
 
 template <class T>
