@@ -6,6 +6,7 @@
 #include <string>
 
 #include "droqbxml/diagnostics/clsMyErr.hpp"
+#include "droqbxml/records/internal/TagIndex.hpp"
 #include "droqbxml/records/internal/TextSearch.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
@@ -43,6 +44,20 @@ size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
   return spaced;
 }
 
+// Whether the read's index (when it has one) shows at once that an element read from 0-based
+// `from` finds nothing: no "/>" ends within the self-closing window, and the text holds no
+// start tag "<N>" while the index covers that form.
+bool absentByIndex(const Text& value, TextView name, size_t from) {
+  const internal::TagIndex* index = internal::SearchScope::indexOf(value);
+  if (index == nullptr || from > value.size()) return false;
+  const size_t close = index->findSelfClose(from);
+  if (close != TextView::npos && close + 2 <= std::min(value.size(), from + kSelfClosingWindow)) {
+    return false;
+  }
+  return !name.empty() && index->nameGroup(name) == internal::TagIndex::kNone &&
+         internal::TagIndex::coversName(name);
+}
+
 }  // namespace
 
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {
@@ -62,44 +77,49 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
-  // "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names.
-  const size_t n = ElementName.size();
-  char16_t onStack[128];
-  thread_local Text forLongNames;
-  char16_t* tags = onStack;
-  if (2 * n + 5 > std::size(onStack)) {
-    forLongNames.resize(2 * n + 5);
-    tags = forLongNames.data();
-  }
-  tags[0] = u'<';
-  std::char_traits<char16_t>::copy(tags + 1, ElementName.data(), n);
-  tags[n + 1] = u'>';
-  tags[n + 2] = u'<';
-  tags[n + 3] = u'/';
-  std::char_traits<char16_t>::copy(tags + n + 4, ElementName.data(), n);
-  tags[2 * n + 4] = u'>';
-  const TextView startTag(tags, n + 2);
-  const TextView endTag(tags + n + 2, n + 3);
-  if (from <= Value.size()) {
-    const size_t at = selfClosingAt(Value, from, startTag.substr(0, n + 1));
-    if (at != Text::npos) {
-      // Empty by its form: the required test is not made.
-      StartPoint = static_cast<int32_t>(at + 1);
-      EndPoint = findInResponse(StartPoint, Value, u"/>");
-      return {};
-    }
-  }
   Text result;
-  const int32_t start = findInResponse(cursor, Value, startTag);
-  if (start > 0) {
-    StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;
-    EndPoint = findInResponse(StartPoint, Value, endTag);
-    if (EndPoint > 0) {
-      result = Value.substr(static_cast<size_t>(StartPoint - 1),
-                            static_cast<size_t>(EndPoint - StartPoint));
-    }
-  } else {
+  // Most elements a record asks for are absent from the response: the index tells.
+  if (absentByIndex(Value, ElementName, from)) {
     StartPoint = cursor;
+  } else {
+    // "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names.
+    const size_t n = ElementName.size();
+    char16_t onStack[128];
+    thread_local Text forLongNames;
+    char16_t* tags = onStack;
+    if (2 * n + 5 > std::size(onStack)) {
+      forLongNames.resize(2 * n + 5);
+      tags = forLongNames.data();
+    }
+    tags[0] = u'<';
+    std::char_traits<char16_t>::copy(tags + 1, ElementName.data(), n);
+    tags[n + 1] = u'>';
+    tags[n + 2] = u'<';
+    tags[n + 3] = u'/';
+    std::char_traits<char16_t>::copy(tags + n + 4, ElementName.data(), n);
+    tags[2 * n + 4] = u'>';
+    const TextView startTag(tags, n + 2);
+    const TextView endTag(tags + n + 2, n + 3);
+    if (from <= Value.size()) {
+      const size_t at = selfClosingAt(Value, from, startTag.substr(0, n + 1));
+      if (at != Text::npos) {
+        // Empty by its form: the required test is not made.
+        StartPoint = static_cast<int32_t>(at + 1);
+        EndPoint = findInResponse(StartPoint, Value, u"/>");
+        return {};
+      }
+    }
+    const int32_t start = findInResponse(cursor, Value, startTag);
+    if (start > 0) {
+      StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;
+      EndPoint = findInResponse(StartPoint, Value, endTag);
+      if (EndPoint > 0) {
+        result = Value.substr(static_cast<size_t>(StartPoint - 1),
+                              static_cast<size_t>(EndPoint - StartPoint));
+      }
+    } else {
+      StartPoint = cursor;
+    }
   }
   if (result.empty() && Required) {
     raiseEmptyElementError(Text(Parent) + Text(ParentTail) + u"<" + Text(ElementName) + u">",

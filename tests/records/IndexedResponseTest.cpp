@@ -10,6 +10,7 @@
 #include "droqbxml/records/DroInvoice.hpp"
 #include "droqbxml/records/DroInvoiceLine.hpp"
 #include "droqbxml/records/IndexedResponse.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 #include "tests/TestSupport.hpp"
 
 namespace droqbxml {
@@ -109,8 +110,14 @@ TEST(IndexedResponseTest, ReadsExactlyWhatThePlainTextReads) {
     std::mt19937 random(seed);
     for (int round = 0; round < 300; ++round) {
       const auto start = static_cast<int32_t>(random() % (text.size() + 2));
-      ASSERT_EQ((readWith<DroCustomer>(indexed, start)), (readWith<DroCustomer>(text, start)))
-          << seed << " " << start;
+      const Text customer = readWith<DroCustomer>(text, start);
+      ASSERT_EQ((readWith<DroCustomer>(indexed, start)), customer) << seed << " " << start;
+      {
+        // Under a scope over another text every search is a literal one: no index answers.
+        const Text elsewhere(u"x");
+        const internal::SearchScope blocking(elsewhere);
+        ASSERT_EQ((readWith<DroCustomer>(text, start)), customer) << seed << " " << start;
+      }
       ASSERT_EQ((readWith<DroAccount>(indexed, start)), (readWith<DroAccount>(text, start)));
       ASSERT_EQ((readWith<DroInvoice>(indexed, start)), (readWith<DroInvoice>(text, start)));
     }

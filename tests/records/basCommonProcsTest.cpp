@@ -91,7 +91,7 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   const Text other = text.substr(1);
   const internal::TagIndex index(text);
   const internal::TagIndex narrow(text, false);  // SSE2 only, where the first may use AVX2
-  std::vector<uint32_t> hints;                    // notes of the searches made with them
+  std::vector<uint32_t> hints;                   // notes of the searches made with them
   // Inside a read's scope too (which indexes the text once its searches have gone far), with
   // cursors that go back as well as forward, and for a text the scope is not over.
   const internal::SearchScope scope(text);
@@ -129,6 +129,18 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
   EXPECT_FALSE(internal::TagIndex::covers(u"<A b=\"1\">"));
   EXPECT_FALSE(internal::TagIndex::covers(u"<B/>"));
   EXPECT_TRUE(internal::TagIndex::covers(u"<A >"));
+  // A bracket anywhere in a name of any length (the check takes four units at a time).
+  for (size_t length = 1; length < 10; ++length) {
+    const Text name(length, u'=');
+    EXPECT_TRUE(internal::TagIndex::covers(u"<" + name + u">"));
+    for (size_t at = 0; at < length; ++at) {
+      for (const char16_t bracket : {u'<', u'>'}) {
+        Text odd = name;
+        odd[at] = bracket;
+        EXPECT_FALSE(internal::TagIndex::covers(u"<" + odd + u">")) << toUtf8(odd);
+      }
+    }
+  }
   // "/>" and tags at every offset of the index's blocks, across their boundaries too.
   for (size_t k = 0; k < 80; ++k) {
     const Text shifted = Text(k, u'x') + u"/>" + Text(k % 37, u'y') + u"<A>z</A><A>";

@@ -6,6 +6,8 @@
 #include <algorithm>
 #include <cstring>
 
+#include "droqbxml/records/internal/TextSearch.hpp"
+
 #if defined(__SSE2__)
 #include <emmintrin.h>
 #endif
@@ -23,22 +25,6 @@ namespace {
 bool startsName(char16_t first) { return first != u'/' && first != u'?' && first != u'!'; }
 // A name ending so is an attribute's value or a self-closed tag's slash.
 bool endsName(char16_t last) { return last != u'"' && last != u'\'' && last != u'/'; }
-
-// Whether the n code units at a and b are the same, compared eight bytes at a time (names
-// are short: a call to memcmp would cost more than the comparison).
-bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
-  for (; n >= 4; n -= 4, a += 4, b += 4) {
-    uint64_t x;
-    uint64_t y;
-    std::memcpy(&x, a, 8);
-    std::memcpy(&y, b, 8);
-    if (x != y) return false;
-  }
-  for (; n > 0; --n) {
-    if (*a++ != *b++) return false;
-  }
-  return true;
-}
 
 // The scan's block loop, once for each instruction set (TagScanLoop.inc): `Units` gives
 // that set's vector of code units, how to load and compare one, and the mask of a bit a
@@ -134,10 +120,23 @@ void forEachTag(TextView text, bool wide, Tag tag, SelfClose selfClose) {
 
 bool TagIndex::covers(TextView pattern) {
   if (pattern.size() < 3 || pattern.front() != u'<' || pattern.back() != u'>') return false;
-  const TextView name = pattern.substr(1, pattern.size() - 2);
-  if (!startsName(name.front()) || !endsName(name.back())) return false;
-  for (const char16_t c : name) {
-    if (c == u'<' || c == u'>') return false;
+  return coversName(pattern.substr(1, pattern.size() - 2));
+}
+
+bool TagIndex::coversName(TextView name) {
+  if (name.empty() || !startsName(name.front()) || !endsName(name.back())) return false;
+  // '<' and '>' are the only units that give '>' with bit 1 set; four units a word, a
+  // unit of the word that is then zero found by the usual borrow test.
+  const char16_t* at = name.data();
+  size_t n = name.size();
+  for (; n >= 4; n -= 4, at += 4) {
+    uint64_t word;
+    std::memcpy(&word, at, 8);
+    const uint64_t x = (word | 0x0002000200020002ull) ^ 0x003E003E003E003Eull;
+    if (((x - 0x0001000100010001ull) & ~x & 0x8000800080008000ull) != 0) return false;
+  }
+  for (; n > 0; --n, ++at) {
+    if ((*at | 2) == u'>') return false;
   }
   return true;
 }
@@ -167,7 +166,8 @@ uint32_t TagIndex::groupOf(size_t at, size_t length) {
 uint32_t TagIndex::findGroup(TextView name) const {
   const Slot& slot = slots_[slotOf(name.size(), name.front(), name.back())];
   if (slot.first == UINT32_MAX) return UINT32_MAX;
-  if (slot.length == name.size() && text_.substr(slot.first, name.size()) == name) {
+  if (slot.length == name.size() &&
+      sameUnits(text_.data() + slot.first, name.data(), name.size())) {
     return slot.group;
   }
   const auto known = others_.find(name);
@@ -200,9 +200,8 @@ TagIndex::TagIndex(TextView text, bool wide) : text_(text) {
   for (const Tag& tag : tags) at_[next[tag.group]++] = tag.at;
 }
 
-size_t TagIndex::find(TextView pattern, size_t from, std::vector<uint32_t>* hints) const {
-  const uint32_t group = findGroup(pattern.substr(1, pattern.size() - 2));
-  if (group == UINT32_MAX) return TextView::npos;
+size_t TagIndex::findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints) const {
+  if (group == kNone) return TextView::npos;
   uint32_t* hint = nullptr;
   if (hints != nullptr) {
     if (hints->size() < groups_) hints->resize(groups_, UINT32_MAX);

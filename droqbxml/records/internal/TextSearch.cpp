@@ -51,7 +51,7 @@ size_t findForward(TextView text, TextView pattern, size_t from) {
   for (size_t at = from; at <= last; ++at) {
     at = findPair(text.data(), at, last, pattern[0], pattern[1]);
     if (at == TextView::npos) return TextView::npos;
-    if (text.substr(at + 2, rest.size()) == rest) return at;
+    if (sameUnits(text.data() + at + 2, rest.data(), rest.size())) return at;
   }
   return TextView::npos;
 }
@@ -88,34 +88,45 @@ size_t SearchScope::find(const Text& text, TextView pattern, size_t from) {
   return scope->search(pattern, from);
 }
 
+const TagIndex* SearchScope::indexOf(const Text& text) {
+  const SearchScope* scope = openScope;
+  return scope != nullptr && scope->text_ == &text ? scope->index_ : nullptr;
+}
+
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
   size_t at = TextView::npos;
   // "/>" is looked for before every element read and seldom found: the index answers at once.
   const bool selfClose = pattern == TagIndex::kSelfClose;
   if (index_ != nullptr && selfClose) return index_->findSelfClose(from);
-  const bool tag = TagIndex::covers(pattern);
+  // End tags are not indexed: only a start tag's pattern is worth looking up.
+  const bool shaped = pattern.size() >= 3 && pattern.front() == u'<' && pattern.back() == u'>' &&
+                      pattern[1] != u'/';
   // Most elements a record asks for are absent from the whole response: the index says so
-  // without a look at the text.
-  if (index_ != nullptr && tag && !index_->holds(pattern)) return TextView::npos;
+  // without a look at the text. A name the index holds is one it covers; only the others
+  // need the check.
+  uint32_t group = TagIndex::kNone;
+  if (index_ != nullptr && shaped) {
+    group = index_->tagGroup(pattern);
+    if (group == TagIndex::kNone && TagIndex::covers(pattern)) return TextView::npos;
+  }
   if (pattern == last_ && lastAnswer_.covers(from, at)) return at;
   size_t end = std::min(text.size(), from + kNear);
   at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
-  if (tag || selfClose) {
-    if (index_ == nullptr && text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
-      // Not found nearby: a little further, else (it is far or absent) index the text for
-      // this search and the rest of the read. The first read of a response gets here with
-      // "/>", which a response seldom holds: the index's one pass finds that it is absent
-      // and serves every later tag as well.
-      end = std::min(text.size(), from + kIndexedSize);
-      at = findForward(text.substr(0, end), pattern, from);
-      if (at != TextView::npos || end == text.size()) return at;
-      ownIndex_ = std::make_unique<TagIndex>(text);
-      index_ = ownIndex_.get();
-    }
-    if (index_ != nullptr)
-      return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from, &hints_);
+  if (group != TagIndex::kNone) return index_->findIn(group, from, &hints_);
+  if (index_ == nullptr && (selfClose || (shaped && TagIndex::covers(pattern))) &&
+      text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
+    // Not found nearby: a little further, else (it is far or absent) index the text for
+    // this search and the rest of the read. The first read of a response gets here with
+    // "/>", which a response seldom holds: the index's one pass finds that it is absent
+    // and serves every later tag as well.
+    end = std::min(text.size(), from + kIndexedSize);
+    at = findForward(text.substr(0, end), pattern, from);
+    if (at != TextView::npos || end == text.size()) return at;
+    ownIndex_ = std::make_unique<TagIndex>(text);
+    index_ = ownIndex_.get();
+    return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from, &hints_);
   }
   if (!answers_.empty() && remembered(pattern, from, at)) return at;
   at = findForward(text, pattern, from);

@@ -17,6 +17,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <functional>
 #include <memory>
 #include <unordered_map>
@@ -27,6 +28,22 @@
 namespace droqbxml::internal {
 
 class TagIndex;
+
+// Whether the n code units at a and b are the same, compared eight bytes at a time (tags
+// are short: a call to memcmp, or a loop a unit at a time, would cost more).
+inline bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
+  for (; n >= 4; n -= 4, a += 4, b += 4) {
+    uint64_t x;
+    uint64_t y;
+    std::memcpy(&x, a, 8);
+    std::memcpy(&y, b, 8);
+    if (x != y) return false;
+  }
+  for (; n > 0; --n) {
+    if (*a++ != *b++) return false;
+  }
+  return true;
+}
 
 // The first position (0-based) at or after `from` where `pattern` occurs in `text`, or
 // Text::npos: exactly what text.find(pattern, from) gives.
@@ -45,6 +62,9 @@ class SearchScope {
 
   // findForward(text, pattern, from), from the open scope's memory when it is over text.
   static size_t find(const Text& text, TextView pattern, size_t from);
+  // The index the open scope reads `text` with, when it has one by now: an index of
+  // exactly that text.
+  static const TagIndex* indexOf(const Text& text);
 
  private:
   size_t search(TextView pattern, size_t from);
