@@ -3,6 +3,7 @@
 // std::to_chars, which do not depend on the process locale.
 #include "droqbxml/runtime/Numbers.hpp"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 #include <cmath>
@@ -201,8 +202,8 @@ double decimalToDouble(const Decimal& d) {
 // The 15-significant-digit decimal form of a finite double.
 Decimal fifteenDigits(double value) {
   std::array<char, 64> buffer{};
-  const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(),
-                                    std::fabs(value), std::chars_format::scientific, 14);
+  const auto result = std::to_chars(buffer.data(), buffer.data() + buffer.size(), std::fabs(value),
+                                    std::chars_format::scientific, 14);
   const std::string text(buffer.data(), result.ptr);
   Decimal d;
   d.negative = value < 0;
@@ -274,6 +275,13 @@ bool isNumeric(TextView text) {
 double textToDouble(TextView text) { return decimalToDouble(parseOrMismatch(text)); }
 
 int32_t textToLong(TextView text) {
+  // Plain digits (at most nine: no overflow) are the number they spell.
+  if (!text.empty() && text.size() <= 9 &&
+      std::all_of(text.begin(), text.end(), [](char16_t c) { return c >= u'0' && c <= u'9'; })) {
+    int32_t number = 0;
+    for (const char16_t c : text) number = number * 10 + (c - u'0');
+    return number;
+  }
   return static_cast<int32_t>(scaledInRange(parseOrMismatch(text), 0,
                                             std::numeric_limits<int32_t>::min(),
                                             std::numeric_limits<int32_t>::max()));
@@ -340,20 +348,26 @@ Text currencyToText(int64_t units) {
   return asciiText(negative ? "-" + text : text);
 }
 
+bool isPlainFixed(TextView text, int decimals) {
+  if (decimals <= 0 || text.size() <= static_cast<size_t>(decimals) + 1 || text.size() > 16) {
+    return false;
+  }
+  const size_t point = text.size() - static_cast<size_t>(decimals) - 1;
+  bool plain = text[point] == u'.';
+  for (size_t i = 0; plain && i < text.size(); ++i) {
+    plain = i == point || (text[i] >= u'0' && text[i] <= u'9');
+  }
+  return plain;
+}
+
 Text formatFixed(TextView text, int decimals) {
   // Most texts are already digits, ".", and `decimals` decimals (amounts as QuickBooks
   // writes them): with at most fifteen digits the number's fifteen-digit form is those
   // digits, so the pattern is the text without the integer part's leading zeros.
-  if (decimals > 0 && text.size() > static_cast<size_t>(decimals) + 1 && text.size() <= 16) {
+  if (isPlainFixed(text, decimals)) {
     const size_t point = text.size() - static_cast<size_t>(decimals) - 1;
-    bool plain = text[point] == u'.';
-    for (size_t i = 0; plain && i < text.size(); ++i) {
-      plain = i == point || (text[i] >= u'0' && text[i] <= u'9');
-    }
-    if (plain) {
-      const size_t zeros = text.substr(0, point).find_first_not_of(u'0');
-      return Text(text.substr(zeros == TextView::npos ? point : zeros));
-    }
+    const size_t zeros = text.substr(0, point).find_first_not_of(u'0');
+    return Text(text.substr(zeros == TextView::npos ? point : zeros));
   }
   const auto d = parseDecimal(text);
   if (!d) return Text(text);

@@ -39,6 +39,10 @@ Text currencyToText(int64_t units);
 // decimal form. Text that is not numeric is returned unchanged.
 Text formatFixed(TextView text, int decimals);
 Text formatFixed(double value, int decimals);
+// Whether `text` is already in the form formatFixed reads directly: digits, ".", exactly
+// `decimals` decimals, and at most fifteen digits. Its pattern is then the text without
+// the integer part's leading zeros, and formatting that text's number again gives it back.
+bool isPlainFixed(TextView text, int decimals);
 
 }  // namespace droqbxml
 

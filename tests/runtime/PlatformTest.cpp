@@ -73,8 +73,22 @@ TEST(NumbersTest, PlainAmountsFormatAsThroughADouble) {
     for (auto digits = random() % 16; digits > 0; --digits) text += char16_t(u'0' + random() % 10);
     text += u'.';
     for (int k = 0; k < decimals; ++k) text += char16_t(u'0' + random() % 10);
-    ASSERT_EQ(formatFixed(text, decimals), formatFixed(textToDouble(text), decimals))
-        << toUtf8(text);
+    const Text plain = formatFixed(text, decimals);
+    ASSERT_EQ(plain, formatFixed(textToDouble(text), decimals)) << toUtf8(text);
+    // The amount check keeps that text rather than formatting its number again.
+    ASSERT_EQ(formatFixed(textToDouble(plain), decimals), plain) << toUtf8(text);
+  }
+}
+
+// Up to nine plain digits are read as they stand: the same as the general conversion.
+TEST(NumbersTest, PlainDigitsReadAsThroughADouble) {
+  std::mt19937 random(12);
+  for (int round = 0; round < 20000; ++round) {
+    Text text;
+    for (auto digits = 1 + random() % 10; digits > 0; --digits)
+      text += char16_t(u'0' + random() % 10);
+    if (text.size() == 10 && text > u"2147483647") continue;
+    ASSERT_EQ(textToLong(text), doubleToLong(textToDouble(text))) << toUtf8(text);
   }
 }
 
