@@ -21,7 +21,7 @@ int32_t DroAccount::ParseRs(const Text& Value, int32_t StartPoint) {
   return parseList(Value, StartPoint, u"<AccountRet>", [&](Reader& read, int32_t& s, int32_t& e) {
     readHeader(read);
     read.required<u"IsActive">();
-    parentRef_->ParseRs(u"ParentRef", Value, s, e);
+    parentRef_.ParseRs(u"ParentRef", Value, s, e);
     read.required<u"Sublevel">();
     read.optional<u"AccountType", u"DetailAccountType", u"AccountNumber", u"LastCheckNumber",
                   u"Desc", u"Balance", u"TotalBalance", u"OpenBalance", u"OpenBalanceDate">();

@@ -43,7 +43,7 @@ class DroAccount final : public ListRecordOf<DroAccount> {
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
   // The parent account, created with the record and replaceable.
-  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_.held(); }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
 
   const Text& AccountType() const { return field<u"AccountType">(); }
@@ -79,7 +79,7 @@ class DroAccount final : public ListRecordOf<DroAccount> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroParentRef> parentRef_;
+  mutable ObjectProperty<DroParentRef> parentRef_;
 };
 
 }  // namespace droqbxml

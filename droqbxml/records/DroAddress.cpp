@@ -37,12 +37,18 @@ void DroAddress::CopyAddress(const Ref<DroAddress>& oAddress) {
   State(oAddress->State());
 }
 
+bool DroAddress::parsesNothing(TextView AddressName, const Text& Value, int32_t& StartPoint,
+                               const int32_t& EndPoint) {
+  const int32_t from = StartPoint != 0 ? StartPoint : EndPoint == 0 ? 1 : EndPoint;
+  if (basCommonProcs::findInResponse(from, Value, startTagOf(AddressName)) != 0) return false;
+  StartPoint = 0;
+  return true;
+}
+
 void DroAddress::ParseRs(TextView AddressName, const Text& Value, int32_t& StartPoint,
                          int32_t& EndPoint) {
   if (StartPoint == 0) StartPoint = EndPoint == 0 ? 1 : EndPoint;
-  thread_local Text tag;  // "<AddressName>", made without allocating on most calls
-  tag.assign(u"<").append(AddressName).push_back(u'>');
-  StartPoint = basCommonProcs::findInResponse(StartPoint, Value, tag);
+  StartPoint = basCommonProcs::findInResponse(StartPoint, Value, startTagOf(AddressName));
   if (StartPoint == 0) return;
   FieldReader<DroAddress>(*this, Value, StartPoint, EndPoint)
       .optional<u"Addr1", u"Addr2", u"Addr3", u"City", u"State", u"PostalCode", u"Country">();

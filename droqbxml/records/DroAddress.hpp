@@ -56,6 +56,10 @@ class DroAddress final : public RecordOf<DroAddress> {
   // Finds "<AddressName>" from StartPoint (0 is read as EndPoint, then 1); when present,
   // reads the seven fields from the cursor EndPoint. Absent: StartPoint becomes 0.
   void ParseRs(TextView AddressName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint);
+  // When that ParseRs would find no "<AddressName>": true, with StartPoint moved as it would
+  // be. Otherwise false, and nothing moves.
+  static bool parsesNothing(TextView AddressName, const Text& Value, int32_t& StartPoint,
+                            const int32_t& EndPoint);
   Text PrintOut() const;
 
  private:

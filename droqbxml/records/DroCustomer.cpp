@@ -79,24 +79,24 @@ int32_t DroCustomer::ParseRs(const Text& Value, int32_t StartPoint) {
   FieldReader<DroCustomer> read(*this, Value, start, end, u"<CustomerRet>");
   read.required<u"ListID", u"TimeCreated", u"TimeModified", u"EditSequence", u"Name", u"FullName",
                 u"IsActive">();
-  parentRef_->ParseRs(u"ParentRef", Value, start, end);
+  parentRef_.ParseRs(u"ParentRef", Value, start, end);
   read.required<u"Sublevel">();
   read.optional<u"CompanyName", u"Salutation", u"FirstName", u"MiddleName", u"LastName",
                 u"Suffix">();
-  billAddress_->ParseRs(u"BillAddress", Value, start, end);
+  billAddress_.ParseRs(u"BillAddress", Value, start, end);
   // "Fax" and "IsStatementWithParent" are not read.
   read.optional<u"PrintAs", u"Phone", u"Mobile", u"Pager", u"AltPhone", u"Email", u"Contact",
                 u"AltContact">();
-  customerTypeRef_->ParseRs(u"CustomerTypeRef", Value, start, end);
-  shipAddress_->ParseRs(u"ShipAddress", Value, start, end);
-  termsRef_->ParseRs(u"TermsRef", Value, start, end);
-  salesRepRef_->ParseRs(u"SalesRepRef", Value, start, end);
+  customerTypeRef_.ParseRs(u"CustomerTypeRef", Value, start, end);
+  shipAddress_.ParseRs(u"ShipAddress", Value, start, end);
+  termsRef_.ParseRs(u"TermsRef", Value, start, end);
+  salesRepRef_.ParseRs(u"SalesRepRef", Value, start, end);
   read.optional<u"Balance", u"OpenBalance", u"OpenBalanceDate", u"TotalBalance">();
-  salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, start, end);
-  itemSalesTaxRef_->ParseRs(u"ItemSalesTaxRef", Value, start, end);
+  salesTaxCodeRef_.ParseRs(u"SalesTaxCodeRef", Value, start, end);
+  itemSalesTaxRef_.ParseRs(u"ItemSalesTaxRef", Value, start, end);
   read.optional<u"ResaleNumber", u"AccountNumber", u"CreditLimit", u"JobStatus", u"JobStartDate",
                 u"JobProjectedEndDate", u"JobEndDate", u"JobDesc">();
-  jobTypeRef_->ParseRs(u"JobTypeRef", Value, start, end);
+  jobTypeRef_.ParseRs(u"JobTypeRef", Value, start, end);
   read.optional<u"Notes", u"DeliveryMethod">();
   return end;
 }
@@ -111,7 +111,7 @@ int32_t DroCustomer::ParseCustInfo(const Text& sValueA, int32_t lStartPointA) {
   FieldReader<DroCustomer> read(*this, sValueA, start, end);
   read.required<u"NonQbFileName">();
   read.optional<u"FirstName", u"MiddleName", u"LastName", u"CompanyName">();
-  billAddress_->ParseRs(u"BillAddress", sValueA, start, end);
+  billAddress_.ParseRs(u"BillAddress", sValueA, start, end);
   read.optional<u"NonQbJobName">();
   NonQbCityStateZip(billAddress_->City() + u", " + billAddress_->State() + u"  " +
                     billAddress_->PostalCode());

@@ -71,23 +71,29 @@ class DroCustomer final : public RecordOf<DroCustomer> {
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
   // Sub-records, created with the customer and replaceable.
-  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_.held(); }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
-  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_; }
+  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_.held(); }
   void BillAddress(Ref<DroAddress> v) { billAddress_ = std::move(v); }
-  const ObjectProperty<DroCustomerTypeRef>& CustomerTypeRef() const { return customerTypeRef_; }
+  const ObjectProperty<DroCustomerTypeRef>& CustomerTypeRef() const {
+    return customerTypeRef_.held();
+  }
   void CustomerTypeRef(Ref<DroCustomerTypeRef> v) { customerTypeRef_ = std::move(v); }
-  const ObjectProperty<DroAddress>& ShipAddress() const { return shipAddress_; }
+  const ObjectProperty<DroAddress>& ShipAddress() const { return shipAddress_.held(); }
   void ShipAddress(Ref<DroAddress> v) { shipAddress_ = std::move(v); }
-  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_; }
+  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_.held(); }
   void TermsRef(Ref<DroTermsRef> v) { termsRef_ = std::move(v); }
-  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_; }
+  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_.held(); }
   void SalesRepRef(Ref<DroSalesRepRef> v) { salesRepRef_ = std::move(v); }
-  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const {
+    return salesTaxCodeRef_.held();
+  }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
-  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const { return itemSalesTaxRef_; }
+  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const {
+    return itemSalesTaxRef_.held();
+  }
   void ItemSalesTaxRef(Ref<DroItemSalesTaxRef> v) { itemSalesTaxRef_ = std::move(v); }
-  const ObjectProperty<DroJobTypeRef>& JobTypeRef() const { return jobTypeRef_; }
+  const ObjectProperty<DroJobTypeRef>& JobTypeRef() const { return jobTypeRef_.held(); }
   void JobTypeRef(Ref<DroJobTypeRef> v) { jobTypeRef_ = std::move(v); }
 
   // The collection this customer belongs to; a new empty one is created on first read.
@@ -211,15 +217,15 @@ class DroCustomer final : public RecordOf<DroCustomer> {
  private:
   void applyRule(size_t index, const Text& checked) override;
 
-  ObjectProperty<DroParentRef> parentRef_;
-  ObjectProperty<DroAddress> billAddress_;
-  ObjectProperty<DroCustomerTypeRef> customerTypeRef_;
-  ObjectProperty<DroAddress> shipAddress_;
-  ObjectProperty<DroTermsRef> termsRef_;
-  ObjectProperty<DroSalesRepRef> salesRepRef_;
-  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
-  ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
-  ObjectProperty<DroJobTypeRef> jobTypeRef_;
+  mutable ObjectProperty<DroParentRef> parentRef_;
+  mutable ObjectProperty<DroAddress> billAddress_;
+  mutable ObjectProperty<DroCustomerTypeRef> customerTypeRef_;
+  mutable ObjectProperty<DroAddress> shipAddress_;
+  mutable ObjectProperty<DroTermsRef> termsRef_;
+  mutable ObjectProperty<DroSalesRepRef> salesRepRef_;
+  mutable ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  mutable ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
+  mutable ObjectProperty<DroJobTypeRef> jobTypeRef_;
   mutable Ref<droqbxml::DroCustomerCol> collection_;
 };
 

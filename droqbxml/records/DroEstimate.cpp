@@ -30,21 +30,21 @@ const ClassInfo& DroEstimate::typeInfo() {
 int32_t DroEstimate::ParseRs(const Text& Value, int32_t StartPoint) {
   return parseTxn(Value, StartPoint, [&](Reader& read, int32_t& s, int32_t& e) {
     read.required<u"TxnID", u"TimeCreated", u"TimeModified", u"EditSequence", u"TxnNumber">();
-    customerRef_->ParseRs(u"CustomerRef", Value, s, e, true, u"<EstimateAddRet>");
-    classRef_->ParseRs(u"ClassRef", Value, s, e);
+    customerRef_.ParseRs(u"CustomerRef", Value, s, e, true, u"<EstimateAddRet>");
+    classRef_.ParseRs(u"ClassRef", Value, s, e);
     read.required<u"TxnDate">();
     read.optional<u"RefNumber">();
-    billAddress_->ParseRs(u"BillAddress", Value, s, e);
+    billAddress_.ParseRs(u"BillAddress", Value, s, e);
     read.optional<u"PONumber">();
-    termsRef_->ParseRs(u"TermsRef", Value, s, e);
+    termsRef_.ParseRs(u"TermsRef", Value, s, e);
     read.optional<u"DueDate">();
-    salesRepRef_->ParseRs(u"SalesRepRef", Value, s, e);
+    salesRepRef_.ParseRs(u"SalesRepRef", Value, s, e);
     read.optional<u"FOB", u"Subtotal">();
-    itemSalesTaxRef_->ParseRs(u"ItemSalesTaxRef", Value, s, e);
+    itemSalesTaxRef_.ParseRs(u"ItemSalesTaxRef", Value, s, e);
     read.optional<u"SalesTaxPercentage", u"SalesTaxTotal", u"TotalAmount", u"Memo">();
-    customerMsgRef_->ParseRs(u"CustomerMsgRef", Value, s, e);
+    customerMsgRef_.ParseRs(u"CustomerMsgRef", Value, s, e);
     read.optional<u"IsToBePrinted">();
-    customerSalesTaxCodeRef_->ParseRs(u"CustomerSalesTaxCodeRef", Value, s, e);
+    customerSalesTaxCodeRef_.ParseRs(u"CustomerSalesTaxCodeRef", Value, s, e);
   });
 }
 

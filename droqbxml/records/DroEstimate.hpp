@@ -32,9 +32,11 @@ class DroEstimate final : public TxnRecordOf<DroEstimate, TxnKind::Estimate> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroEstimateLineCol>& EstimateLines() const { return lines_; }
+  const ObjectProperty<DroEstimateLineCol>& EstimateLines() const { return lines_.held(); }
   void EstimateLines(Ref<DroEstimateLineCol> v) { lines_ = std::move(v); }
-  const ObjectProperty<DroEstimateLineGroupCol>& EstimateLineGroups() const { return groups_; }
+  const ObjectProperty<DroEstimateLineGroupCol>& EstimateLineGroups() const {
+    return groups_.held();
+  }
   void EstimateLineGroups(Ref<DroEstimateLineGroupCol> v) { groups_ = std::move(v); }
 
   const Text& TotalAmount() const { return field<u"TotalAmount">(); }

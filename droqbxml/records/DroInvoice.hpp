@@ -49,15 +49,15 @@ class DroInvoice final : public TxnRecordOf<DroInvoice, TxnKind::Invoice> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroAccountRef>& ARAccountRef() const { return arAccountRef_; }
+  const ObjectProperty<DroAccountRef>& ARAccountRef() const { return arAccountRef_.held(); }
   void ARAccountRef(Ref<DroAccountRef> v) { arAccountRef_ = std::move(v); }
-  const ObjectProperty<DroAddress>& ShipAddress() const { return shipAddress_; }
+  const ObjectProperty<DroAddress>& ShipAddress() const { return shipAddress_.held(); }
   void ShipAddress(Ref<DroAddress> v) { shipAddress_ = std::move(v); }
-  const ObjectProperty<DroShipMethodRef>& ShipMethodRef() const { return shipMethodRef_; }
+  const ObjectProperty<DroShipMethodRef>& ShipMethodRef() const { return shipMethodRef_.held(); }
   void ShipMethodRef(Ref<DroShipMethodRef> v) { shipMethodRef_ = std::move(v); }
-  const ObjectProperty<DroInvoiceLineCol>& InvoiceLines() const { return lines_; }
+  const ObjectProperty<DroInvoiceLineCol>& InvoiceLines() const { return lines_.held(); }
   void InvoiceLines(Ref<DroInvoiceLineCol> v) { lines_ = std::move(v); }
-  const ObjectProperty<DroInvoiceLineGroupCol>& InvoiceLineGroups() const { return groups_; }
+  const ObjectProperty<DroInvoiceLineGroupCol>& InvoiceLineGroups() const { return groups_.held(); }
   void InvoiceLineGroups(Ref<DroInvoiceLineGroupCol> v) { groups_ = std::move(v); }
 
   const Text& IsPending() const { return field<u"IsPending">(); }
@@ -84,9 +84,9 @@ class DroInvoice final : public TxnRecordOf<DroInvoice, TxnKind::Invoice> {
   }
 
  private:
-  ObjectProperty<DroAccountRef> arAccountRef_;
-  ObjectProperty<DroAddress> shipAddress_;
-  ObjectProperty<DroShipMethodRef> shipMethodRef_;
+  mutable ObjectProperty<DroAccountRef> arAccountRef_;
+  mutable ObjectProperty<DroAddress> shipAddress_;
+  mutable ObjectProperty<DroShipMethodRef> shipMethodRef_;
 };
 
 }  // namespace droqbxml

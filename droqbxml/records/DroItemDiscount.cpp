@@ -23,12 +23,12 @@ int32_t DroItemDiscount::ParseRs(const Text& Value, const int32_t& StartPoint) {
                    [&](Reader& read, int32_t& s, int32_t& e) {
                      readHeader(read);
                      read.required<u"IsActive">();
-                     parentRef_->ParseRs(u"ParentRef", Value, s, e);
+                     parentRef_.ParseRs(u"ParentRef", Value, s, e);
                      read.required<u"Sublevel">();
                      read.optional<u"ItemDesc">();
-                     salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, s, e);
+                     salesTaxCodeRef_.ParseRs(u"SalesTaxCodeRef", Value, s, e);
                      read.optional<u"DiscountRate", u"DiscountRatePercent">();
-                     accountRef_->ParseRs(u"AccountRef", Value, s, e);
+                     accountRef_.ParseRs(u"AccountRef", Value, s, e);
                    });
 }
 

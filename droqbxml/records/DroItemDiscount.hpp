@@ -26,11 +26,13 @@ class DroItemDiscount final : public ItemRecordOf<DroItemDiscount> {
   void DiscountRate(const Text& v) { setField<u"DiscountRate">(v); }
   const Text& DiscountRatePercent() const { return field<u"DiscountRatePercent">(); }
   void DiscountRatePercent(const Text& v) { setField<u"DiscountRatePercent">(v); }
-  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_.held(); }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
-  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const {
+    return salesTaxCodeRef_.held();
+  }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
-  const ObjectProperty<DroAccountRef>& AccountRef() const { return accountRef_; }
+  const ObjectProperty<DroAccountRef>& AccountRef() const { return accountRef_.held(); }
   void AccountRef(Ref<DroAccountRef> v) { accountRef_ = std::move(v); }
 
   // As DroAccount::ParseRs, for "<ItemDiscountRet>" (StartPoint by reference, unchanged).
@@ -42,9 +44,9 @@ class DroItemDiscount final : public ItemRecordOf<DroItemDiscount> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroParentRef> parentRef_;
-  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
-  ObjectProperty<DroAccountRef> accountRef_;
+  mutable ObjectProperty<DroParentRef> parentRef_;
+  mutable ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  mutable ObjectProperty<DroAccountRef> accountRef_;
 };
 
 }  // namespace droqbxml

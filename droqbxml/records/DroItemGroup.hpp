@@ -24,7 +24,9 @@ class DroItemGroup final : public ItemRecordOf<DroItemGroup> {
 
   const Text& IsPrintItemsInGroup() const { return field<u"IsPrintItemsInGroup">(); }
   void IsPrintItemsInGroup(const Text& v) { setField<u"IsPrintItemsInGroup">(v); }
-  const ObjectProperty<DroItemGroupLineCol>& ItemGroupLines() const { return itemGroupLines_; }
+  const ObjectProperty<DroItemGroupLineCol>& ItemGroupLines() const {
+    return itemGroupLines_.held();
+  }
   void ItemGroupLines(Ref<DroItemGroupLineCol> v) { itemGroupLines_ = std::move(v); }
 
   // As DroAccount::ParseRs, for "<ItemGroupRet>" (StartPoint by reference, unchanged); the
@@ -37,7 +39,7 @@ class DroItemGroup final : public ItemRecordOf<DroItemGroup> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroItemGroupLineCol> itemGroupLines_;
+  mutable ObjectProperty<DroItemGroupLineCol> itemGroupLines_;
 };
 
 }  // namespace droqbxml

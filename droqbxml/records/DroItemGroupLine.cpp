@@ -20,7 +20,7 @@ const ClassInfo& DroItemGroupLine::typeInfo() {
 bool DroItemGroupLine::IsEmpty() const { return Quantity().empty() && itemRef_->IsEmpty(); }
 
 void DroItemGroupLine::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
-  itemRef_->ParseRs(u"ItemRef", Value, StartPoint, EndPoint);
+  itemRef_.ParseRs(u"ItemRef", Value, StartPoint, EndPoint);
   FieldReader<DroItemGroupLine>(*this, Value, StartPoint, EndPoint).optional<u"Quantity">();
 }
 

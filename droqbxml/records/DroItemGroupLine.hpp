@@ -21,7 +21,7 @@ class DroItemGroupLine final : public RecordOf<DroItemGroupLine> {
 
   const Text& Quantity() const { return field<u"Quantity">(); }
   void Quantity(const Text& v) { setField<u"Quantity">(v); }
-  const ObjectProperty<DroItemRef>& ItemRef() const { return itemRef_; }
+  const ObjectProperty<DroItemRef>& ItemRef() const { return itemRef_.held(); }
   void ItemRef(Ref<DroItemRef> v) { itemRef_ = std::move(v); }
 
   // True when Quantity is "" and the item reference is empty.
@@ -31,7 +31,7 @@ class DroItemGroupLine final : public RecordOf<DroItemGroupLine> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroItemRef> itemRef_;
+  mutable ObjectProperty<DroItemRef> itemRef_;
 };
 
 }  // namespace droqbxml

@@ -27,15 +27,15 @@ int32_t DroItemInventory::ParseRs(const Text& Value, int32_t StartPoint) {
     const Text parent(tag);
     readHeader(read);
     read.required<u"IsActive">();
-    parentRef_->ParseRs(u"ParentRef", Value, s, e);
+    parentRef_.ParseRs(u"ParentRef", Value, s, e);
     read.required<u"Sublevel">();
-    salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, s, e);
+    salesTaxCodeRef_.ParseRs(u"SalesTaxCodeRef", Value, s, e);
     read.optional<u"SalesDesc", u"SalesPrice">();
-    incomeAccountRef_->ParseRs(u"IncomeAccountRef", Value, s, e, true, parent);
+    incomeAccountRef_.ParseRs(u"IncomeAccountRef", Value, s, e, true, parent);
     read.optional<u"PurchaseDesc", u"PurchaseCost">();
-    cogsAccountRef_->ParseRs(u"COGSAccountRef", Value, s, e, true, parent);
-    prefVendorRef_->ParseRs(u"PrefVendorRef", Value, s, e);
-    assetAccountRef_->ParseRs(u"AssetAccountRef", Value, s, e, true, parent);
+    cogsAccountRef_.ParseRs(u"COGSAccountRef", Value, s, e, true, parent);
+    prefVendorRef_.ParseRs(u"PrefVendorRef", Value, s, e);
+    assetAccountRef_.ParseRs(u"AssetAccountRef", Value, s, e, true, parent);
     read.optional<u"ReorderPoint", u"QuantityOnHand", u"AverageCost", u"QuantityOnOrder",
                   u"TotalValue", u"InventoryDate">();
   });

@@ -39,17 +39,21 @@ class DroItemInventory final : public ItemRecordOf<DroItemInventory> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_.held(); }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
-  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const {
+    return salesTaxCodeRef_.held();
+  }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
-  const ObjectProperty<DroIncomeAccountRef>& IncomeAccountRef() const { return incomeAccountRef_; }
+  const ObjectProperty<DroIncomeAccountRef>& IncomeAccountRef() const {
+    return incomeAccountRef_.held();
+  }
   void IncomeAccountRef(Ref<DroIncomeAccountRef> v) { incomeAccountRef_ = std::move(v); }
-  const ObjectProperty<DroAccountRef>& COGSAccountRef() const { return cogsAccountRef_; }
+  const ObjectProperty<DroAccountRef>& COGSAccountRef() const { return cogsAccountRef_.held(); }
   void COGSAccountRef(Ref<DroAccountRef> v) { cogsAccountRef_ = std::move(v); }
-  const ObjectProperty<DroPrefVendorRef>& PrefVendorRef() const { return prefVendorRef_; }
+  const ObjectProperty<DroPrefVendorRef>& PrefVendorRef() const { return prefVendorRef_.held(); }
   void PrefVendorRef(Ref<DroPrefVendorRef> v) { prefVendorRef_ = std::move(v); }
-  const ObjectProperty<DroAccountRef>& AssetAccountRef() const { return assetAccountRef_; }
+  const ObjectProperty<DroAccountRef>& AssetAccountRef() const { return assetAccountRef_.held(); }
   void AssetAccountRef(Ref<DroAccountRef> v) { assetAccountRef_ = std::move(v); }
 
   const Text& SalesDesc() const { return field<u"SalesDesc">(); }
@@ -82,12 +86,12 @@ class DroItemInventory final : public ItemRecordOf<DroItemInventory> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroParentRef> parentRef_;
-  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
-  ObjectProperty<DroIncomeAccountRef> incomeAccountRef_;
-  ObjectProperty<DroAccountRef> cogsAccountRef_;
-  ObjectProperty<DroPrefVendorRef> prefVendorRef_;
-  ObjectProperty<DroAccountRef> assetAccountRef_;
+  mutable ObjectProperty<DroParentRef> parentRef_;
+  mutable ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  mutable ObjectProperty<DroIncomeAccountRef> incomeAccountRef_;
+  mutable ObjectProperty<DroAccountRef> cogsAccountRef_;
+  mutable ObjectProperty<DroPrefVendorRef> prefVendorRef_;
+  mutable ObjectProperty<DroAccountRef> assetAccountRef_;
 };
 
 }  // namespace droqbxml

@@ -23,8 +23,8 @@ int32_t DroItemPayment::ParseRs(const Text& Value, int32_t StartPoint) {
                      readHeader(read);
                      read.required<u"IsActive">();
                      read.optional<u"ItemDesc">();
-                     depositToAccountRef_->ParseRs(u"DepositToAccountRef", Value, s, e);
-                     paymentMethodRef_->ParseRs(u"PaymentMethodRef", Value, s, e);
+                     depositToAccountRef_.ParseRs(u"DepositToAccountRef", Value, s, e);
+                     paymentMethodRef_.ParseRs(u"PaymentMethodRef", Value, s, e);
                    });
 }
 

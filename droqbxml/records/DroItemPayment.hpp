@@ -19,9 +19,13 @@ class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroAccountRef>& DepositToAccountRef() const { return depositToAccountRef_; }
+  const ObjectProperty<DroAccountRef>& DepositToAccountRef() const {
+    return depositToAccountRef_.held();
+  }
   void DepositToAccountRef(Ref<DroAccountRef> v) { depositToAccountRef_ = std::move(v); }
-  const ObjectProperty<DroPaymentMethodRef>& PaymentMethodRef() const { return paymentMethodRef_; }
+  const ObjectProperty<DroPaymentMethodRef>& PaymentMethodRef() const {
+    return paymentMethodRef_.held();
+  }
   void PaymentMethodRef(Ref<DroPaymentMethodRef> v) { paymentMethodRef_ = std::move(v); }
 
   // As DroAccount::ParseRs, for "<ItemPaymentRet>".
@@ -33,8 +37,8 @@ class DroItemPayment final : public ItemRecordOf<DroItemPayment> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroAccountRef> depositToAccountRef_;
-  ObjectProperty<DroPaymentMethodRef> paymentMethodRef_;
+  mutable ObjectProperty<DroAccountRef> depositToAccountRef_;
+  mutable ObjectProperty<DroPaymentMethodRef> paymentMethodRef_;
 };
 
 }  // namespace droqbxml

@@ -22,7 +22,7 @@ int32_t DroItemSalesTax::ParseRs(const Text& Value, int32_t StartPoint) {
                      readHeader(read);
                      read.required<u"IsActive">();
                      read.optional<u"ItemDesc", u"TaxRate">();
-                     taxVendorRef_->ParseRs(u"TaxVendorRef", Value, s, e);
+                     taxVendorRef_.ParseRs(u"TaxVendorRef", Value, s, e);
                    });
 }
 

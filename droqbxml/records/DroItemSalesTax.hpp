@@ -23,7 +23,7 @@ class DroItemSalesTax final : public ItemRecordOf<DroItemSalesTax> {
 
   const Text& TaxRate() const { return field<u"TaxRate">(); }
   void TaxRate(const Text& v) { setField<u"TaxRate">(v); }
-  const ObjectProperty<DroVendorRef>& TaxVendorRef() const { return taxVendorRef_; }
+  const ObjectProperty<DroVendorRef>& TaxVendorRef() const { return taxVendorRef_.held(); }
   void TaxVendorRef(Ref<DroVendorRef> v) { taxVendorRef_ = std::move(v); }
 
   // As DroAccount::ParseRs, for "<ItemSalesTaxRet>".
@@ -35,7 +35,7 @@ class DroItemSalesTax final : public ItemRecordOf<DroItemSalesTax> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroVendorRef> taxVendorRef_;
+  mutable ObjectProperty<DroVendorRef> taxVendorRef_;
 };
 
 }  // namespace droqbxml

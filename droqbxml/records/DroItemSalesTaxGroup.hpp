@@ -21,7 +21,7 @@ class DroItemSalesTaxGroup final : public ItemRecordOf<DroItemSalesTaxGroup> {
 
   // The group's members. Parsing takes them as DroItemSalesTax records; the add request
   // takes them as DroItemSalesTaxRef references.
-  const ObjectProperty<DroItemsCol>& ItemSalesTaxRefs() const { return itemSalesTaxRefs_; }
+  const ObjectProperty<DroItemsCol>& ItemSalesTaxRefs() const { return itemSalesTaxRefs_.held(); }
   void ItemSalesTaxRefs(Ref<DroItemsCol> v) { itemSalesTaxRefs_ = std::move(v); }
 
   // As DroAccount::ParseRs, for "<ItemSalesTaxGroupRet>"; then every member, in order, runs
@@ -35,7 +35,7 @@ class DroItemSalesTaxGroup final : public ItemRecordOf<DroItemSalesTaxGroup> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroItemsCol> itemSalesTaxRefs_;
+  mutable ObjectProperty<DroItemsCol> itemSalesTaxRefs_;
 };
 
 }  // namespace droqbxml

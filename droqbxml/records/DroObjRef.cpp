@@ -22,12 +22,16 @@ void DroObjRef::fieldStored(size_t) { hasData_ = !ListID().empty() || !FullName(
 
 void DroObjRef::ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
                         bool Required, TextView Parent) {
-  thread_local Text tag;  // "<RefName>", made without allocating on most calls
-  tag.assign(u"<").append(RefName).push_back(u'>');
+  const TextView tag = startTagOf(RefName);
   if (basCommonProcs::findInResponse(EndPoint, Value, tag) == 0) return;
   FieldReader<DroObjRef> reader(*this, Value, StartPoint, EndPoint, Parent, tag);
   reader.read(index<u"ListID">(), Required);
   reader.read(index<u"FullName">(), Required);
+}
+
+bool DroObjRef::parsesNothing(TextView RefName, const Text& Value, const int32_t&,
+                              const int32_t& EndPoint, bool, TextView) {
+  return basCommonProcs::findInResponse(EndPoint, Value, startTagOf(RefName)) == 0;
 }
 
 Text DroObjRef::PrintOut() const {

@@ -32,6 +32,9 @@ class DroObjRef final : public RecordOf<DroObjRef> {
   // without FullName takes the next one in the text). Otherwise nothing changes.
   void ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
                bool Required = false, TextView Parent = {});
+  // Whether that ParseRs would find no "<RefName>" (and so change nothing).
+  static bool parsesNothing(TextView RefName, const Text& Value, const int32_t& StartPoint,
+                            const int32_t& EndPoint, bool Required = false, TextView Parent = {});
   Text PrintOut() const;
 
  private:

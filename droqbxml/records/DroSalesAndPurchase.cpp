@@ -35,10 +35,10 @@ void DroSalesAndPurchase::ParseRs(const Text&, const Text& Value, int32_t& Start
   const Text path = Parent + u"<SalesAndPurchase>";
   FieldReader<DroSalesAndPurchase> read(*this, Value, StartPoint, EndPoint, path);
   read.optional<u"SalesDesc", u"SalesPrice">();
-  incomeAccountRef_->ParseRs(u"IncomeAccountRef", Value, StartPoint, EndPoint, true, path);
+  incomeAccountRef_.ParseRs(u"IncomeAccountRef", Value, StartPoint, EndPoint, true, path);
   read.optional<u"PurchaseDesc", u"PurchaseCost">();
-  expenseAccountRef_->ParseRs(u"ExpenseAccountRef", Value, StartPoint, EndPoint, true, path);
-  prefVendorRef_->ParseRs(u"PrefVendorRef", Value, StartPoint, EndPoint);
+  expenseAccountRef_.ParseRs(u"ExpenseAccountRef", Value, StartPoint, EndPoint, true, path);
+  prefVendorRef_.ParseRs(u"PrefVendorRef", Value, StartPoint, EndPoint);
 }
 
 Text DroSalesAndPurchase::PrintOut() const {

@@ -32,13 +32,15 @@ class DroSalesAndPurchase final : public RecordOf<DroSalesAndPurchase> {
   void PurchaseDesc(const Text& v) { setField<u"PurchaseDesc">(v); }
   const Text& PurchaseCost() const { return field<u"PurchaseCost">(); }
   void PurchaseCost(const Text& v) { setField<u"PurchaseCost">(v); }
-  const ObjectProperty<DroIncomeAccountRef>& IncomeAccountRef() const { return incomeAccountRef_; }
+  const ObjectProperty<DroIncomeAccountRef>& IncomeAccountRef() const {
+    return incomeAccountRef_.held();
+  }
   void IncomeAccountRef(Ref<DroIncomeAccountRef> v) { incomeAccountRef_ = std::move(v); }
   const ObjectProperty<DroExpenseAccountRef>& ExpenseAccountRef() const {
-    return expenseAccountRef_;
+    return expenseAccountRef_.held();
   }
   void ExpenseAccountRef(Ref<DroExpenseAccountRef> v) { expenseAccountRef_ = std::move(v); }
-  const ObjectProperty<DroPrefVendorRef>& PrefVendorRef() const { return prefVendorRef_; }
+  const ObjectProperty<DroPrefVendorRef>& PrefVendorRef() const { return prefVendorRef_.held(); }
   void PrefVendorRef(Ref<DroPrefVendorRef> v) { prefVendorRef_ = std::move(v); }
 
   // True when the four texts are "" and the three references are empty.
@@ -50,9 +52,9 @@ class DroSalesAndPurchase final : public RecordOf<DroSalesAndPurchase> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroIncomeAccountRef> incomeAccountRef_;
-  ObjectProperty<DroExpenseAccountRef> expenseAccountRef_;
-  ObjectProperty<DroPrefVendorRef> prefVendorRef_;
+  mutable ObjectProperty<DroIncomeAccountRef> incomeAccountRef_;
+  mutable ObjectProperty<DroExpenseAccountRef> expenseAccountRef_;
+  mutable ObjectProperty<DroPrefVendorRef> prefVendorRef_;
 };
 
 }  // namespace droqbxml

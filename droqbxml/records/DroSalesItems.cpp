@@ -27,13 +27,13 @@ int32_t DroSalesItem<Kind>::ParseRs(const Text& Value, int32_t StartPoint) {
                          [&](Reader& read, int32_t& s, int32_t& e) {
                            this->readHeader(read);
                            read.template required<u"IsActive">();
-                           parentRef_->ParseRs(u"ParentRef", Value, s, e);
+                           parentRef_.ParseRs(u"ParentRef", Value, s, e);
                            if constexpr (kSpec.sublevelRequired) {
                              read.template required<u"Sublevel">();
                            } else {
                              read.template optional<u"Sublevel">();
                            }
-                           salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, s, e);
+                           salesTaxCodeRef_.ParseRs(u"SalesTaxCodeRef", Value, s, e);
                            const Text parent(kSpec.returnTag);
                            salesOrPurchase_->ParseRs(u"SalesOrPurchase", Value, s, e, parent);
                            if (s == 0)

@@ -44,13 +44,19 @@ class DroSalesItem final : public ItemRecordOf<DroSalesItem<Kind>> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_; }
+  const ObjectProperty<DroParentRef>& ParentRef() const { return parentRef_.held(); }
   void ParentRef(Ref<DroParentRef> v) { parentRef_ = std::move(v); }
-  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const {
+    return salesTaxCodeRef_.held();
+  }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
-  const ObjectProperty<DroSalesOrPurchase>& SalesOrPurchase() const { return salesOrPurchase_; }
+  const ObjectProperty<DroSalesOrPurchase>& SalesOrPurchase() const {
+    return salesOrPurchase_.held();
+  }
   void SalesOrPurchase(Ref<DroSalesOrPurchase> v) { salesOrPurchase_ = std::move(v); }
-  const ObjectProperty<DroSalesAndPurchase>& SalesAndPurchase() const { return salesAndPurchase_; }
+  const ObjectProperty<DroSalesAndPurchase>& SalesAndPurchase() const {
+    return salesAndPurchase_.held();
+  }
   void SalesAndPurchase(Ref<DroSalesAndPurchase> v) { salesAndPurchase_ = std::move(v); }
 
   // As DroAccount::ParseRs, for the kind's return element. The sales-and-purchase side is
@@ -64,10 +70,10 @@ class DroSalesItem final : public ItemRecordOf<DroSalesItem<Kind>> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroParentRef> parentRef_;
-  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
-  ObjectProperty<DroSalesOrPurchase> salesOrPurchase_;
-  ObjectProperty<DroSalesAndPurchase> salesAndPurchase_;
+  mutable ObjectProperty<DroParentRef> parentRef_;
+  mutable ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  mutable ObjectProperty<DroSalesOrPurchase> salesOrPurchase_;
+  mutable ObjectProperty<DroSalesAndPurchase> salesAndPurchase_;
 };
 
 using DroItemNonInventory = DroSalesItem<SalesItemKind::NonInventory>;

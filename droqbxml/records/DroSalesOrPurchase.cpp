@@ -38,7 +38,7 @@ void DroSalesOrPurchase::ParseRs(const Text&, const Text& Value, int32_t& StartP
     PricePercent(
         basCommonProcs::getElementValue(Value, u"PricePrecent", StartPoint, EndPoint, true, path));
   }
-  accountRef_->ParseRs(u"AccountRef", Value, StartPoint, EndPoint, true, path);
+  accountRef_.ParseRs(u"AccountRef", Value, StartPoint, EndPoint, true, path);
 }
 
 Text DroSalesOrPurchase::PrintOut() const {

@@ -29,7 +29,7 @@ class DroSalesOrPurchase final : public RecordOf<DroSalesOrPurchase> {
   void Price(const Text& v) { setField<u"Price">(v); }
   const Text& PricePercent() const { return field<u"PricePercent">(); }
   void PricePercent(const Text& v) { setField<u"PricePercent">(v); }
-  const ObjectProperty<DroAccountRef>& AccountRef() const { return accountRef_; }
+  const ObjectProperty<DroAccountRef>& AccountRef() const { return accountRef_.held(); }
   void AccountRef(Ref<DroAccountRef> v) { accountRef_ = std::move(v); }
 
   // True when the three texts are "" and the account reference is empty.
@@ -42,7 +42,7 @@ class DroSalesOrPurchase final : public RecordOf<DroSalesOrPurchase> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroAccountRef> accountRef_;
+  mutable ObjectProperty<DroAccountRef> accountRef_;
 };
 
 }  // namespace droqbxml

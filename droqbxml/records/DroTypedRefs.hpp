@@ -83,6 +83,10 @@ class DroTypedRef final : public Object {
   // passes false and "" so that a missing ListID never raises.
   void ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint, int32_t& EndPoint,
                bool Required = false, TextView Parent = {});
+  static bool parsesNothing(TextView RefName, const Text& Value, const int32_t& StartPoint,
+                            const int32_t& EndPoint, bool = false, TextView = {}) {
+    return DroObjRef::parsesNothing(RefName, Value, StartPoint, EndPoint);
+  }
   Text PrintOut() const { return inner_.PrintOut(); }
 
  private:

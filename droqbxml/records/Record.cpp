@@ -66,6 +66,12 @@ OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView retu
   return {true, false, start, close};
 }
 
+TextView startTagOf(TextView name) {
+  thread_local Text tag;  // made without allocating on most calls
+  tag.assign(u"<").append(name).push_back(u'>');
+  return tag;
+}
+
 Record::Record(std::span<const FieldSpec> fields)
     : fields_(fields),
       spilled_(fields.size() > kInline ? fields.size() : 0),
@@ -90,7 +96,6 @@ Record& Record::operator=(const Record& other) {
   return *this;
 }
 
-
 Text Record::fieldValueUnescaped(size_t index) const {
   return XMLUnEscapeText(values_[index], false);
 }
@@ -106,11 +111,11 @@ void Record::setFieldValue(size_t index, Text value) {
     if (kept.size() != value.size()) value = Text(kept);
   }
   // The checks that can only give the value back are skipped: most fields read from a
-  // response are texts within their length.
-  const bool unchanged =
-      row.check == Check::None || row.check == Check::DateTime || row.check == Check::Id ||
-      ((row.check == Check::Str || row.check == Check::StrCut) &&
-       (row.arg < 1 || value.size() <= static_cast<size_t>(row.arg)));
+  // response are absent (every check gives "" for "") or texts within their length.
+  const bool unchanged = value.empty() || row.check == Check::None ||
+                         row.check == Check::DateTime || row.check == Check::Id ||
+                         ((row.check == Check::Str || row.check == Check::StrCut) &&
+                          (row.arg < 1 || value.size() <= static_cast<size_t>(row.arg)));
   if (!unchanged) value = checked(row, std::move(value));
   if (row.rule == Rule::Specific) {
     applyRule(index, value);

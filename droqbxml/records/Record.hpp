@@ -83,26 +83,54 @@ consteval size_t fieldIndex(const std::array<FieldSpec, K>& fields, std::u16stri
 }
 
 // An object property of a record (a reference, an address, a companion record, a line
-// collection): created with the record, replaceable by the host, "nothing" included
-// (Set rec.BillAddress = Nothing). It hands out the reference as it is; whatever uses the
-// sub-record through it (the record's parse and dump, the builders) gets the runtime's 91
-// when it holds nothing, as a call through an unset object variable does on the platform.
+// collection): it holds a fresh object from the start, as far as anyone can tell, and the
+// host may replace it, "nothing" included (Set rec.BillAddress = Nothing). It hands out
+// the reference as it is; whatever uses the sub-record through it (the record's parse and
+// dump, the builders) gets the runtime's 91 when it holds nothing, as a call through an
+// unset object variable does on the platform.
+//
+// The fresh object is made when something first uses the property: most of a response's
+// references and addresses are absent, and a parse that finds nothing leaves a fresh object
+// as it was. Records declare their properties mutable, so that a const getter can make it.
 template <class T>
 class ObjectProperty : public Ref<T> {
  public:
-  ObjectProperty() : Ref<T>(std::make_shared<T>()) {}
+  ObjectProperty() = default;
   ObjectProperty& operator=(Ref<T> other) {
     Ref<T>::operator=(std::move(other));
+    pending_ = false;
     return *this;
   }
   T& operator*() const { return *used(); }
   T* operator->() const { return used(); }
+  // The property as the host sees it (what the record's getter returns).
+  const ObjectProperty& held() const {
+    if (pending_) make();
+    return *this;
+  }
+
+  // The sub-record's ParseRs, through the property. Where the sub-record's class tells that
+  // a parse would find nothing (T::parsesNothing moves the cursors as that parse would), a
+  // property whose object is still to be made stays so.
+  template <class... Args>
+  void ParseRs(Args&&... args) const {
+    if (pending_ && T::parsesNothing(args...)) return;
+    used()->ParseRs(std::forward<Args>(args)...);
+  }
 
  private:
+  void make() const {
+    auto& self = const_cast<ObjectProperty&>(*this);  // a mutable member (see above)
+    self.Ref<T>::operator=(std::make_shared<T>());
+    self.pending_ = false;
+  }
   T* used() const {
+    if (pending_) make();
     if (!this->get()) raiseRuntimeError(RuntimeError::kObjectNotSet);
     return this->get();
   }
+
+  bool pending_ = true;
 };
 
 // Where a list record's own response is, for the records that are found by their return
@@ -119,6 +147,9 @@ struct OwnResponse {
 // is another request's and requestId is not ""; otherwise found.
 OwnResponse findOwnResponse(const Text& value, int32_t startPoint, TextView returnTag,
                             const Text& requestId);
+
+// "<" + name + ">", in a buffer of the thread's own that its next call reuses.
+TextView startTagOf(TextView name);
 
 // The ParseRs that reads a Text, picked from a record's two (the other reads an
 // IndexedResponse): the one bound by name.
@@ -254,9 +285,9 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  record_.setFieldValue(index, basCommonProcs::getElementValue(
-                                   value_, record_.fieldSpecs()[index].name, start_, end_,
-                                   isRequired, parent_, parentTail_));
+  record_.setFieldValue(
+      index, basCommonProcs::getElementValue(value_, record_.fieldSpecs()[index].name, start_, end_,
+                                             isRequired, parent_, parentTail_));
 }
 
 }  // namespace droqbxml

@@ -76,11 +76,11 @@ template <TxnKind Kind>
 void DroTxnLine<Kind>::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
   FieldReader<DroTxnLine> read(*this, Value, StartPoint, EndPoint, kSpec.lineContext);
   read.template required<u"TxnLineID">();
-  itemRef_->ParseRs(u"ItemRef", Value, StartPoint, EndPoint);
+  itemRef_.ParseRs(u"ItemRef", Value, StartPoint, EndPoint);
   read.template optional<u"Desc", u"Quantity", u"Rate", u"RatePercent">();
-  classRef_->ParseRs(u"ClassRef", Value, StartPoint, EndPoint);
+  classRef_.ParseRs(u"ClassRef", Value, StartPoint, EndPoint);
   read.template optional<u"Amount">();
-  salesTaxCodeRef_->ParseRs(u"SalesTaxCodeRef", Value, StartPoint, EndPoint);
+  salesTaxCodeRef_.ParseRs(u"SalesTaxCodeRef", Value, StartPoint, EndPoint);
   if constexpr (kEstimate) read.template optional<u"MarkupRate", u"MarkupRatePercent">();
 }
 
@@ -188,7 +188,7 @@ template <TxnKind Kind>
 void DroTxnLineGroup<Kind>::ParseRs(const Text& Value, int32_t& StartPoint, int32_t& EndPoint) {
   const internal::SearchScope scope(Value);
   const Text context(kSpec.groupContext);
-  itemGroupRef_->ParseRs(u"ItemGroupRef", Value, StartPoint, EndPoint, true, context);
+  itemGroupRef_.ParseRs(u"ItemGroupRef", Value, StartPoint, EndPoint, true, context);
   FieldReader<DroTxnLineGroup> read(*this, Value, StartPoint, EndPoint, context);
   read.template optional<u"Desc", u"Quantity">();
   read.template required<u"IsPrintItemsInGroup">();

@@ -96,11 +96,13 @@ class DroTxnLine final : public RecordOf<DroTxnLine<Kind>> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroItemRef>& ItemRef() const { return itemRef_; }
+  const ObjectProperty<DroItemRef>& ItemRef() const { return itemRef_.held(); }
   void ItemRef(Ref<DroItemRef> v) { itemRef_ = std::move(v); }
-  const ObjectProperty<DroClassRef>& ClassRef() const { return classRef_; }
+  const ObjectProperty<DroClassRef>& ClassRef() const { return classRef_.held(); }
   void ClassRef(Ref<DroClassRef> v) { classRef_ = std::move(v); }
-  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const { return salesTaxCodeRef_; }
+  const ObjectProperty<DroSalesTaxCodeRef>& SalesTaxCodeRef() const {
+    return salesTaxCodeRef_.held();
+  }
   void SalesTaxCodeRef(Ref<DroSalesTaxCodeRef> v) { salesTaxCodeRef_ = std::move(v); }
 
   const Text& TxnLineID() const { return this->template field<u"TxnLineID">(); }
@@ -144,9 +146,9 @@ class DroTxnLine final : public RecordOf<DroTxnLine<Kind>> {
   void Class_Treminate();
 
  private:
-  ObjectProperty<DroItemRef> itemRef_;
-  ObjectProperty<DroClassRef> classRef_;
-  ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
+  mutable ObjectProperty<DroItemRef> itemRef_;
+  mutable ObjectProperty<DroClassRef> classRef_;
+  mutable ObjectProperty<DroSalesTaxCodeRef> salesTaxCodeRef_;
   udItemType itemType_ = udUnknown;
 };
 
@@ -176,14 +178,14 @@ class DroTxnLineGroup final : public RecordOf<DroTxnLineGroup<Kind>> {
   static const ClassInfo& typeInfo();
   const ClassInfo& classInfo() const override { return typeInfo(); }
 
-  const ObjectProperty<DroObjRef>& ItemGroupRef() const { return itemGroupRef_; }
+  const ObjectProperty<DroObjRef>& ItemGroupRef() const { return itemGroupRef_.held(); }
   void ItemGroupRef(Ref<DroObjRef> v) { itemGroupRef_ = std::move(v); }
   const ObjectProperty<DroTxnLineCol<Kind>>& EstimateLines() const requires kEstimate {
-    return lines_;
+    return lines_.held();
   }
   void EstimateLines(Ref<DroTxnLineCol<Kind>> v) requires kEstimate { lines_ = std::move(v); }
   const ObjectProperty<DroTxnLineCol<Kind>>& InvoiceLines() const requires(!kEstimate) {
-    return lines_;
+    return lines_.held();
   }
   void InvoiceLines(Ref<DroTxnLineCol<Kind>> v) requires(!kEstimate) { lines_ = std::move(v); }
 
@@ -211,8 +213,8 @@ class DroTxnLineGroup final : public RecordOf<DroTxnLineGroup<Kind>> {
   Text PrintOut() const;
 
  private:
-  ObjectProperty<DroObjRef> itemGroupRef_;
-  ObjectProperty<DroTxnLineCol<Kind>> lines_;
+  mutable ObjectProperty<DroObjRef> itemGroupRef_;
+  mutable ObjectProperty<DroTxnLineCol<Kind>> lines_;
   mutable bool isEmpty_ = true;
 };
 
@@ -238,22 +240,24 @@ class TxnRecordOf : public RecordOf<Derived> {
   static constexpr const TxnKindSpec& kSpec = kTxnKinds[static_cast<size_t>(Kind)];
   using Reader = FieldReader<Derived>;
 
-  const ObjectProperty<DroCustomerRef>& CustomerRef() const { return customerRef_; }
+  const ObjectProperty<DroCustomerRef>& CustomerRef() const { return customerRef_.held(); }
   void CustomerRef(Ref<DroCustomerRef> v) { customerRef_ = std::move(v); }
-  const ObjectProperty<DroClassRef>& ClassRef() const { return classRef_; }
+  const ObjectProperty<DroClassRef>& ClassRef() const { return classRef_.held(); }
   void ClassRef(Ref<DroClassRef> v) { classRef_ = std::move(v); }
-  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_; }
+  const ObjectProperty<DroAddress>& BillAddress() const { return billAddress_.held(); }
   void BillAddress(Ref<DroAddress> v) { billAddress_ = std::move(v); }
-  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_; }
+  const ObjectProperty<DroTermsRef>& TermsRef() const { return termsRef_.held(); }
   void TermsRef(Ref<DroTermsRef> v) { termsRef_ = std::move(v); }
-  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_; }
+  const ObjectProperty<DroSalesRepRef>& SalesRepRef() const { return salesRepRef_.held(); }
   void SalesRepRef(Ref<DroSalesRepRef> v) { salesRepRef_ = std::move(v); }
-  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const { return itemSalesTaxRef_; }
+  const ObjectProperty<DroItemSalesTaxRef>& ItemSalesTaxRef() const {
+    return itemSalesTaxRef_.held();
+  }
   void ItemSalesTaxRef(Ref<DroItemSalesTaxRef> v) { itemSalesTaxRef_ = std::move(v); }
-  const ObjectProperty<DroCustomerMsgRef>& CustomerMsgRef() const { return customerMsgRef_; }
+  const ObjectProperty<DroCustomerMsgRef>& CustomerMsgRef() const { return customerMsgRef_.held(); }
   void CustomerMsgRef(Ref<DroCustomerMsgRef> v) { customerMsgRef_ = std::move(v); }
   const ObjectProperty<DroCustomerSalesTaxCodeRef>& CustomerSalesTaxCodeRef() const {
-    return customerSalesTaxCodeRef_;
+    return customerSalesTaxCodeRef_.held();
   }
   void CustomerSalesTaxCodeRef(Ref<DroCustomerSalesTaxCodeRef> v) {
     customerSalesTaxCodeRef_ = std::move(v);
@@ -301,16 +305,16 @@ class TxnRecordOf : public RecordOf<Derived> {
   template <class Header>
   int32_t parseTxn(const Text& Value, int32_t StartPoint, Header readHeader);
 
-  ObjectProperty<DroCustomerRef> customerRef_;
-  ObjectProperty<DroClassRef> classRef_;
-  ObjectProperty<DroAddress> billAddress_;
-  ObjectProperty<DroTermsRef> termsRef_;
-  ObjectProperty<DroSalesRepRef> salesRepRef_;
-  ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
-  ObjectProperty<DroCustomerMsgRef> customerMsgRef_;
-  ObjectProperty<DroCustomerSalesTaxCodeRef> customerSalesTaxCodeRef_;
-  ObjectProperty<DroTxnLineCol<Kind>> lines_;
-  ObjectProperty<DroTxnLineGroupCol<Kind>> groups_;
+  mutable ObjectProperty<DroCustomerRef> customerRef_;
+  mutable ObjectProperty<DroClassRef> classRef_;
+  mutable ObjectProperty<DroAddress> billAddress_;
+  mutable ObjectProperty<DroTermsRef> termsRef_;
+  mutable ObjectProperty<DroSalesRepRef> salesRepRef_;
+  mutable ObjectProperty<DroItemSalesTaxRef> itemSalesTaxRef_;
+  mutable ObjectProperty<DroCustomerMsgRef> customerMsgRef_;
+  mutable ObjectProperty<DroCustomerSalesTaxCodeRef> customerSalesTaxCodeRef_;
+  mutable ObjectProperty<DroTxnLineCol<Kind>> lines_;
+  mutable ObjectProperty<DroTxnLineGroupCol<Kind>> groups_;
 };
 
 template <class Derived, TxnKind Kind>
