@@ -218,11 +218,19 @@ Text CheckINTTYPE(const Text& value, const int32_t& mode, const int32_t& upper,
   const bool refused = (mode == kIntLengthMode && static_cast<int64_t>(value.size()) > upper) ||
                        (mode == kIntRangeMode && (number < lower || number > upper));
   if (refused) refuse(kIntRefusal, value);
+  // Digits without a leading zero are the number's own text.
+  const bool digits =
+      std::all_of(value.begin(), value.end(), [](char16_t c) { return c >= u'0' && c <= u'9'; });
+  if (digits && (value.size() == 1 || value[0] != u'0')) return value;
   return asciiText(std::to_string(number));
 }
 
 Text CheckPRICETYPE(const Text& value) {
   if (value.empty()) return {};
+  // Plain digits with at most four decimals are their Currency exactly.
+  if (isPlainFixed(value, 4) && plainIntegerDigits(value) <= kPriceIntegerDigits) {
+    return formatFixed(value, 5);
+  }
   const Text text = currencyToText(textToCurrency(value));
   if (!integerPartWithin(text, kPriceIntegerDigits)) refuse(kPriceRefusal, value);
   return formatFixed(text, 5);
@@ -230,6 +238,10 @@ Text CheckPRICETYPE(const Text& value) {
 
 Text CheckQUANTYPE(const Text& value) {
   if (value.empty()) return {};
+  // Plain digits within the integer digits (and so within the limit) are read as they stand.
+  if (isPlainFixed(value, 5) && plainIntegerDigits(value) <= kQuantityIntegerDigits) {
+    return formatFixed(value, 5);
+  }
   const auto quantity = convertOrNothing(kQuantityRefusal, [&] { return textToDouble(value); });
   if (!quantity || *quantity < -kQuantityLimit || *quantity > kQuantityLimit ||
       !integerPartWithin(doubleToText(*quantity), kQuantityIntegerDigits)) {

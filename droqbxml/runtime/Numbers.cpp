@@ -275,12 +275,12 @@ bool isNumeric(TextView text) {
 double textToDouble(TextView text) { return decimalToDouble(parseOrMismatch(text)); }
 
 int32_t textToLong(TextView text) {
-  // Plain digits (at most nine: no overflow) are the number they spell.
-  if (!text.empty() && text.size() <= 9 &&
+  // Plain digits within the range are the number they spell.
+  if (!text.empty() && text.size() <= 10 &&
       std::all_of(text.begin(), text.end(), [](char16_t c) { return c >= u'0' && c <= u'9'; })) {
-    int32_t number = 0;
+    int64_t number = 0;
     for (const char16_t c : text) number = number * 10 + (c - u'0');
-    return number;
+    if (number <= std::numeric_limits<int32_t>::max()) return static_cast<int32_t>(number);
   }
   return static_cast<int32_t>(scaledInRange(parseOrMismatch(text), 0,
                                             std::numeric_limits<int32_t>::min(),
@@ -348,26 +348,48 @@ Text currencyToText(int64_t units) {
   return asciiText(negative ? "-" + text : text);
 }
 
+namespace {
+
+// The end of the plain integer digits of `text` when it is plain for `decimals` (see
+// isPlainFixed), else npos.
+size_t plainIntegerEnd(TextView text, int decimals) {
+  const auto isDigit = [](char16_t c) { return c >= u'0' && c <= u'9'; };
+  const size_t point =
+      static_cast<size_t>(std::find_if_not(text.begin(), text.end(), isDigit) - text.begin());
+  if (point == 0 || decimals <= 0) return TextView::npos;
+  if (point == text.size()) return point <= 15 ? point : TextView::npos;
+  const size_t fraction = text.size() - point - 1;
+  const bool plain =
+      text[point] == u'.' && fraction >= 1 && fraction <= static_cast<size_t>(decimals) &&
+      text.size() - 1 <= 15 &&
+      std::all_of(text.begin() + static_cast<ptrdiff_t>(point) + 1, text.end(), isDigit);
+  return plain ? point : TextView::npos;
+}
+
+}  // namespace
+
 bool isPlainFixed(TextView text, int decimals) {
-  if (decimals <= 0 || text.size() <= static_cast<size_t>(decimals) + 1 || text.size() > 16) {
-    return false;
-  }
-  const size_t point = text.size() - static_cast<size_t>(decimals) - 1;
-  bool plain = text[point] == u'.';
-  for (size_t i = 0; plain && i < text.size(); ++i) {
-    plain = i == point || (text[i] >= u'0' && text[i] <= u'9');
-  }
-  return plain;
+  return plainIntegerEnd(text, decimals) != TextView::npos;
+}
+
+size_t plainIntegerDigits(TextView text) {
+  const size_t point = std::min(text.find(u'.'), text.size());
+  const size_t zeros = text.substr(0, point).find_first_not_of(u'0');
+  return zeros == TextView::npos ? 1 : point - zeros;
 }
 
 Text formatFixed(TextView text, int decimals) {
-  // Most texts are already digits, ".", and `decimals` decimals (amounts as QuickBooks
-  // writes them): with at most fifteen digits the number's fifteen-digit form is those
-  // digits, so the pattern is the text without the integer part's leading zeros.
-  if (isPlainFixed(text, decimals)) {
-    const size_t point = text.size() - static_cast<size_t>(decimals) - 1;
+  // Most texts are already digits with at most the pattern's decimals (amounts and prices
+  // as QuickBooks writes them): with at most fifteen digits the number's fifteen-digit form
+  // is those digits, so the pattern is the text without the integer part's leading zeros,
+  // its decimals filled up with zeros.
+  if (const size_t point = plainIntegerEnd(text, decimals); point != TextView::npos) {
     const size_t zeros = text.substr(0, point).find_first_not_of(u'0');
-    return Text(text.substr(zeros == TextView::npos ? point : zeros));
+    const size_t fraction = point == text.size() ? 0 : text.size() - point - 1;
+    Text fixed(text.substr(zeros == TextView::npos ? point : zeros));
+    if (fraction == 0) fixed += u'.';
+    fixed.append(static_cast<size_t>(decimals) - fraction, u'0');
+    return fixed;
   }
   const auto d = parseDecimal(text);
   if (!d) return Text(text);

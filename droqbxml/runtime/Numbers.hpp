@@ -39,10 +39,14 @@ Text currencyToText(int64_t units);
 // decimal form. Text that is not numeric is returned unchanged.
 Text formatFixed(TextView text, int decimals);
 Text formatFixed(double value, int decimals);
-// Whether `text` is already in the form formatFixed reads directly: digits, ".", exactly
-// `decimals` decimals, and at most fifteen digits. Its pattern is then the text without
-// the integer part's leading zeros, and formatting that text's number again gives it back.
+// Whether `text` is already in the form formatFixed reads directly: digits, then "." and
+// one to `decimals` decimals or nothing, at most fifteen digits in all. Its pattern is
+// then the text without the integer part's leading zeros and with its decimals filled up,
+// and formatting that text's number again gives it back.
 bool isPlainFixed(TextView text, int decimals);
+// The integer digits of a plain text's number as the runtime writes it: those without
+// leading zeros, or the one "0".
+size_t plainIntegerDigits(TextView text);
 
 }  // namespace droqbxml
 

@@ -4,6 +4,7 @@
 
 #include <random>
 
+#include "droqbxml/qbxml/basValidations.hpp"
 #include "droqbxml/runtime/Clock.hpp"
 #include "droqbxml/runtime/FileSystem.hpp"
 #include "droqbxml/runtime/Numbers.hpp"
@@ -63,32 +64,47 @@ TEST(ClockTest, TheFixedClock) {
   EXPECT_NE(now().year, 2001);
 }
 
-// Texts of digits with the pattern's decimals are formatted without the trip through a
-// Double: the same as with it.
-TEST(NumbersTest, PlainAmountsFormatAsThroughADouble) {
+// Random plain numbers: up to `digits` integer digits (leading zeros too), then "." and
+// up to `decimals` decimals, or no point.
+Text plainNumber(std::mt19937& random, unsigned digits, int decimals) {
+  Text text;
+  for (auto n = 1 + random() % digits; n > 0; --n) text += char16_t(u'0' + random() % 10);
+  if (const auto fraction = random() % (decimals + 1); fraction > 0) {
+    text += u'.';
+    for (auto k = fraction; k > 0; --k) text += char16_t(u'0' + random() % 10);
+  }
+  return text;
+}
+
+// Plain texts are formatted, converted and checked without the trip through a Double or a
+// Currency: the same as with it.
+TEST(NumbersTest, PlainNumbersReadAsThroughADouble) {
+  using namespace basValidations;
   std::mt19937 random(11);
   for (int round = 0; round < 20000; ++round) {
     const int decimals = round % 2 == 0 ? 2 : 5;
-    Text text;
-    for (auto digits = random() % 16; digits > 0; --digits) text += char16_t(u'0' + random() % 10);
-    text += u'.';
-    for (int k = 0; k < decimals; ++k) text += char16_t(u'0' + random() % 10);
+    const Text text = plainNumber(random, 16 - decimals, decimals);
     const Text plain = formatFixed(text, decimals);
     ASSERT_EQ(plain, formatFixed(textToDouble(text), decimals)) << toUtf8(text);
     // The amount check keeps that text rather than formatting its number again.
     ASSERT_EQ(formatFixed(textToDouble(plain), decimals), plain) << toUtf8(text);
-  }
-}
-
-// Up to nine plain digits are read as they stand: the same as the general conversion.
-TEST(NumbersTest, PlainDigitsReadAsThroughADouble) {
-  std::mt19937 random(12);
-  for (int round = 0; round < 20000; ++round) {
-    Text text;
-    for (auto digits = 1 + random() % 10; digits > 0; --digits)
-      text += char16_t(u'0' + random() % 10);
-    if (text.size() == 10 && text > u"2147483647") continue;
-    ASSERT_EQ(textToLong(text), doubleToLong(textToDouble(text))) << toUtf8(text);
+    const Text small = plainNumber(random, 12, decimals);
+    if (plainIntegerDigits(small) <= 10) {
+      ASSERT_EQ(CheckPRICETYPE(small),
+                formatFixed(textToDouble(currencyToText(textToCurrency(small))), 5));
+    } else {
+      ASSERT_THROW(CheckPRICETYPE(small), ComError) << toUtf8(small);
+    }
+    if (const double number = textToDouble(small); number < 1e7) {
+      ASSERT_EQ(CheckQUANTYPE(small), formatFixed(number, 5)) << toUtf8(small);
+    } else {
+      ASSERT_THROW(CheckQUANTYPE(small), ComError) << toUtf8(small);
+    }
+    const Text digits = plainNumber(random, 10, 0);
+    if (const double number = textToDouble(digits); number <= 2147483647) {
+      ASSERT_EQ(textToLong(digits), doubleToLong(number)) << toUtf8(digits);
+      ASSERT_EQ(CheckINTTYPE(digits, 0, 0, 0), asciiText(std::to_string(doubleToLong(number))));
+    }
   }
 }
 
