@@ -2,6 +2,7 @@
 #include "droqbxml/records/DroAddress.hpp"
 
 #include "droqbxml/records/basCommonProcs.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 
 namespace droqbxml {
@@ -40,7 +41,10 @@ void DroAddress::CopyAddress(const Ref<DroAddress>& oAddress) {
 bool DroAddress::parsesNothing(TextView AddressName, const Text& Value, int32_t& StartPoint,
                                const int32_t& EndPoint) {
   const int32_t from = StartPoint != 0 ? StartPoint : EndPoint == 0 ? 1 : EndPoint;
-  if (basCommonProcs::findInResponse(from, Value, startTagOf(AddressName)) != 0) return false;
+  const bool lacks = from >= 1 && internal::SearchScope::lacksStartTag(Value, AddressName);
+  if (!lacks && basCommonProcs::findInResponse(from, Value, startTagOf(AddressName)) != 0) {
+    return false;
+  }
   StartPoint = 0;
   return true;
 }

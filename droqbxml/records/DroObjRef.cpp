@@ -2,6 +2,7 @@
 #include "droqbxml/records/DroObjRef.hpp"
 
 #include "droqbxml/records/basCommonProcs.hpp"
+#include "droqbxml/records/internal/TextSearch.hpp"
 
 namespace droqbxml {
 
@@ -31,6 +32,7 @@ void DroObjRef::ParseRs(TextView RefName, const Text& Value, int32_t& StartPoint
 
 bool DroObjRef::parsesNothing(TextView RefName, const Text& Value, const int32_t&,
                               const int32_t& EndPoint, bool, TextView) {
+  if (EndPoint >= 1 && internal::SearchScope::lacksStartTag(Value, RefName)) return true;
   return basCommonProcs::findInResponse(EndPoint, Value, startTagOf(RefName)) == 0;
 }
 

@@ -44,18 +44,18 @@ size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
   return spaced;
 }
 
-// Whether the read's index (when it has one) shows at once that an element read from 0-based
-// `from` finds nothing: no "/>" ends within the self-closing window, and the text holds no
-// start tag "<N>" while the index covers that form.
-bool absentByIndex(const Text& value, TextView name, size_t from) {
+// What the read's index (when it has one) shows at once of an element read from 0-based
+// `from`: that no "/>" ends within the self-closing window, and then whether the text holds
+// no start tag "<N>" either (the element is absent).
+enum class ByIndex : uint8_t { Unknown, NotSelfClosed, Absent };
+ByIndex byIndex(const Text& value, TextView name, size_t from) {
   const internal::TagIndex* index = internal::SearchScope::indexOf(value);
-  if (index == nullptr || from > value.size()) return false;
+  if (index == nullptr || from > value.size()) return ByIndex::Unknown;
   const size_t close = index->findSelfClose(from);
   if (close != TextView::npos && close + 2 <= std::min(value.size(), from + kSelfClosingWindow)) {
-    return false;
+    return ByIndex::Unknown;
   }
-  return !name.empty() && index->nameGroup(name) == internal::TagIndex::kNone &&
-         internal::TagIndex::coversName(name);
+  return index->lacks(name) ? ByIndex::Absent : ByIndex::NotSelfClosed;
 }
 
 }  // namespace
@@ -79,7 +79,8 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   const auto from = static_cast<size_t>(cursor - 1);
   Text result;
   // Most elements a record asks for are absent from the response: the index tells.
-  if (absentByIndex(Value, ElementName, from)) {
+  const ByIndex known = byIndex(Value, ElementName, from);
+  if (known == ByIndex::Absent) {
     StartPoint = cursor;
   } else {
     // "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names.
@@ -100,7 +101,7 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
     tags[2 * n + 4] = u'>';
     const TextView startTag(tags, n + 2);
     const TextView endTag(tags + n + 2, n + 3);
-    if (from <= Value.size()) {
+    if (known == ByIndex::Unknown && from <= Value.size()) {
       const size_t at = selfClosingAt(Value, from, startTag.substr(0, n + 1));
       if (at != Text::npos) {
         // Empty by its form: the required test is not made.

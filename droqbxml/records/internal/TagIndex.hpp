@@ -50,6 +50,10 @@ class TagIndex {
   }
   // The group of the start tags of a (non-empty) name, or kNone.
   uint32_t nameGroup(TextView name) const { return findGroup(name); }
+  // Whether the index answers for "<" + name + ">" and the text holds it nowhere.
+  bool lacks(TextView name) const {
+    return !name.empty() && findGroup(name) == kNone && coversName(name);
+  }
   size_t findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints = nullptr) const;
 
   // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).

@@ -93,6 +93,11 @@ const TagIndex* SearchScope::indexOf(const Text& text) {
   return scope != nullptr && scope->text_ == &text ? scope->index_ : nullptr;
 }
 
+bool SearchScope::lacksStartTag(const Text& text, TextView name) {
+  const TagIndex* index = indexOf(text);
+  return index != nullptr && index->lacks(name);
+}
+
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
   size_t at = TextView::npos;

@@ -65,6 +65,8 @@ class SearchScope {
   // The index the open scope reads `text` with, when it has one by now: an index of
   // exactly that text.
   static const TagIndex* indexOf(const Text& text);
+  // Whether that index shows that `text` holds "<" + name + ">" nowhere (false without one).
+  static bool lacksStartTag(const Text& text, TextView name);
 
  private:
   size_t search(TextView pattern, size_t from);
