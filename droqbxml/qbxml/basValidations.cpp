@@ -174,8 +174,10 @@ Text CheckBOOLTYPE(const Text& value) { return matchClosedList(value, kBooleans,
 
 Text CheckAMTTYPE(const Text& value) {
   if (value.empty()) return {};
-  // A plain amount's "#.00" text is its final text as well (the double route gives it back).
-  const bool plain = isPlainFixed(value, 2);
+  // A plain amount within the integer digits (and so within the limit) is its "#.00" text.
+  if (isPlainFixed(value, 2) && plainIntegerDigits(value) <= kAmountIntegerDigits) {
+    return formatFixed(value, 2);
+  }
   // Every refusal shows this "#.00" text, not the value given: hosts have always seen it so.
   const Text text =
       convertOrNothing(kAmountRefusal, [&] { return formatFixed(value, 2); }).value_or(value);
@@ -190,7 +192,7 @@ Text CheckAMTTYPE(const Text& value) {
                               text.find(u'.', point + 1) != Text::npos)) {
     refuse(kAmountRefusal, text);
   }
-  return plain ? text : formatFixed(*amount, 2);
+  return formatFixed(*amount, 2);
 }
 
 Text CheckDATETYPE(const Text& value) {

@@ -86,9 +86,12 @@ TEST(NumbersTest, PlainNumbersReadAsThroughADouble) {
     const Text text = plainNumber(random, 16 - decimals, decimals);
     const Text plain = formatFixed(text, decimals);
     ASSERT_EQ(plain, formatFixed(textToDouble(text), decimals)) << toUtf8(text);
-    // The amount check keeps that text rather than formatting its number again.
-    ASSERT_EQ(formatFixed(textToDouble(plain), decimals), plain) << toUtf8(text);
     const Text small = plainNumber(random, 12, decimals);
+    if (decimals == 2 && textToDouble(small) < 1e8) {
+      ASSERT_EQ(CheckAMTTYPE(small), formatFixed(textToDouble(small), 2)) << toUtf8(small);
+    } else if (decimals == 2) {
+      ASSERT_THROW(CheckAMTTYPE(small), ComError) << toUtf8(small);
+    }
     if (plainIntegerDigits(small) <= 10) {
       ASSERT_EQ(CheckPRICETYPE(small),
                 formatFixed(textToDouble(currencyToText(textToCurrency(small))), 5));
