@@ -37,15 +37,8 @@ char* writeUtf8(char* out, char32_t cp) {
 bool isHighSurrogate(char16_t c) { return c >= 0xD800 && c <= 0xDBFF; }
 bool isLowSurrogate(char16_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
 
-}  // namespace
-
-// Both directions first size the result exactly (or by a bound), then write it through a
-// pointer; runs of ASCII, most of any qbXML text, are copied sixteen at a time with SSE2
-// (eight at a time elsewhere).
-
-std::string toUtf8(TextView text) {
-  const char16_t* in = text.data();
-  const size_t n = text.size();
+// The UTF-8 length of n units.
+size_t utf8Length(const char16_t* in, size_t n) {
   size_t bytes = 0;
   for (size_t i = 0; i < n; ++i) {
 #if defined(__SSE2__)
@@ -71,7 +64,23 @@ std::string toUtf8(TextView text) {
       bytes += 3;  // the rest of the plane, and a lone surrogate's U+FFFD
     }
   }
-  std::string out(bytes, '\0');
+  return bytes;
+}
+
+}  // namespace
+
+// Both directions size the result by a bound (UTF-8 to UTF-16, and UTF-16 to UTF-8 until its
+// first unit that is not ASCII, where the rest is sized exactly), then write it through a
+// pointer; runs of ASCII, most of any qbXML text, are copied sixteen at a time with SSE2
+// (eight at a time elsewhere).
+
+std::string toUtf8(TextView text) {
+  const char16_t* in = text.data();
+  const size_t n = text.size();
+  // Every unit takes a byte at least, and exactly one while the text is ASCII: the result
+  // starts at that size and takes its exact size at the first unit that is not ASCII.
+  std::string out(n, '\0');
+  bool exact = false;
   char* dst = out.data();
   size_t i = 0;
   while (i < n) {
@@ -103,6 +112,12 @@ std::string toUtf8(TextView text) {
     }
 #endif
     const char16_t c = in[i];
+    if (c >= 0x80 && !exact) {
+      const auto written = static_cast<size_t>(dst - out.data());
+      out.resize(written + utf8Length(in + i, n - i));
+      dst = out.data() + written;
+      exact = true;
+    }
     char32_t cp = c;
     if (isHighSurrogate(c) && i + 1 < n && isLowSurrogate(in[i + 1])) {
       cp = 0x10000 + ((static_cast<char32_t>(c) - 0xD800) << 10) +

@@ -2,6 +2,7 @@
 // and damaged UTF-8 read: testdata/calls/runtime_conversions.txt).
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <string>
 #include <vector>
@@ -120,6 +121,9 @@ TEST(TextTest, FastConvertersAgreeWithTheReference) {
     }
     ASSERT_EQ(fromUtf8(bytes), referenceFromUtf8(bytes)) << ::testing::PrintToString(bytes);
     ASSERT_EQ(toUtf8(text), referenceToUtf8(text)) << toUtf8(text);
+    const Text ascii(text.begin(),
+                     std::find_if(text.begin(), text.end(), [](char16_t c) { return c >= 0x80; }));
+    ASSERT_EQ(toUtf8(ascii), referenceToUtf8(ascii));
     ASSERT_EQ(fromUtf8(toUtf8(text)), fromUtf8(referenceToUtf8(text)));
   }
 }
