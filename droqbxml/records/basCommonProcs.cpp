@@ -14,6 +14,41 @@ namespace droqbxml::basCommonProcs {
 namespace {
 
 constexpr size_t kSelfClosingWindow = 100;
+// How far from the cursor a tag is looked for first, without the read's memory or index.
+constexpr size_t kNearby = 64;
+
+// "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names,
+// made when first asked for.
+class ElementTags {
+ public:
+  explicit ElementTags(TextView name) : name_(name) {}
+  TextView start() { return {made(), name_.size() + 2}; }
+  TextView end() { return {made() + name_.size() + 2, name_.size() + 3}; }
+
+ private:
+  const char16_t* made() {
+    if (tags_ != nullptr) return tags_;
+    const size_t n = name_.size();
+    thread_local Text forLongNames;
+    tags_ = onStack_;
+    if (2 * n + 5 > std::size(onStack_)) {
+      forLongNames.resize(2 * n + 5);
+      tags_ = forLongNames.data();
+    }
+    tags_[0] = u'<';
+    std::char_traits<char16_t>::copy(tags_ + 1, name_.data(), n);
+    tags_[n + 1] = u'>';
+    tags_[n + 2] = u'<';
+    tags_[n + 3] = u'/';
+    std::char_traits<char16_t>::copy(tags_ + n + 4, name_.data(), n);
+    tags_[2 * n + 4] = u'>';
+    return tags_;
+  }
+
+  TextView name_;
+  char16_t* tags_ = nullptr;
+  char16_t onStack_[128];
+};
 
 [[noreturn]] void raiseEmptyElementError(const Text& path, TextView source) {
   // "a an" is the text hosts have always matched on.
@@ -83,26 +118,9 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   if (known == ByIndex::Absent) {
     StartPoint = cursor;
   } else {
-    // "<N>" and "</N>" side by side in one buffer, on the stack for the usual short names.
-    const size_t n = ElementName.size();
-    char16_t onStack[128];
-    thread_local Text forLongNames;
-    char16_t* tags = onStack;
-    if (2 * n + 5 > std::size(onStack)) {
-      forLongNames.resize(2 * n + 5);
-      tags = forLongNames.data();
-    }
-    tags[0] = u'<';
-    std::char_traits<char16_t>::copy(tags + 1, ElementName.data(), n);
-    tags[n + 1] = u'>';
-    tags[n + 2] = u'<';
-    tags[n + 3] = u'/';
-    std::char_traits<char16_t>::copy(tags + n + 4, ElementName.data(), n);
-    tags[2 * n + 4] = u'>';
-    const TextView startTag(tags, n + 2);
-    const TextView endTag(tags + n + 2, n + 3);
+    ElementTags tags(ElementName);
     if (known == ByIndex::Unknown && from <= Value.size()) {
-      const size_t at = selfClosingAt(Value, from, startTag.substr(0, n + 1));
+      const size_t at = selfClosingAt(Value, from, tags.start().substr(0, ElementName.size() + 1));
       if (at != Text::npos) {
         // Empty by its form: the required test is not made.
         StartPoint = static_cast<int32_t>(at + 1);
@@ -110,10 +128,16 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
         return {};
       }
     }
-    const int32_t start = findInResponse(cursor, Value, startTag);
+    // Elements mostly stand where the cursor is, and their end tags after their text.
+    const size_t near = internal::findTagNear(Value, from, kNearby, ElementName, false);
+    const int32_t start = near != TextView::npos ? static_cast<int32_t>(near + 1)
+                                                 : findInResponse(cursor, Value, tags.start());
     if (start > 0) {
       StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;
-      EndPoint = findInResponse(StartPoint, Value, endTag);
+      const size_t close = internal::findTagNear(Value, static_cast<size_t>(StartPoint - 1),
+                                                 kNearby, ElementName, true);
+      EndPoint = close != TextView::npos ? static_cast<int32_t>(close + 1)
+                                         : findInResponse(StartPoint, Value, tags.end());
       if (EndPoint > 0) {
         result = Value.substr(static_cast<size_t>(StartPoint - 1),
                               static_cast<size_t>(EndPoint - StartPoint));

@@ -117,6 +117,15 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
         }
       }
     }
+    // A tag near the cursor is found as the literal search finds it, else not at all.
+    const size_t window = 1 + round % 80;
+    for (const bool closing : {false, true}) {
+      for (const TextView name : {TextView(u"A"), TextView(u"AxB"), TextView(u"")}) {
+        const size_t literal = text.find((closing ? u"</" : u"<") + Text(name) + u">", from);
+        const size_t near = internal::findTagNear(text, from, window, name, closing);
+        ASSERT_EQ(near, literal < from + window ? literal : Text::npos) << from << " " << window;
+      }
+    }
   }
   {
     // A read whose first far search is "/>" has the text indexed by it.
@@ -149,6 +158,8 @@ TEST(basCommonProcsTest, SearchFindsWhatALiteralSearchFinds) {
       ASSERT_EQ(at.findSelfClose(0), shifted.find(u"/>")) << k;
       for (size_t from = 0; from <= shifted.size(); ++from) {
         ASSERT_EQ(at.find(u"<A>", from), shifted.find(u"<A>", from)) << k;
+        ASSERT_EQ(internal::findTagNear(shifted, from, 64, u"A", false),
+                  shifted.find(u"<A>", from) < from + 64 ? shifted.find(u"<A>", from) : Text::npos);
       }
     }
   }

@@ -49,6 +49,11 @@ inline bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
 // Text::npos: exactly what text.find(pattern, from) gives.
 size_t findForward(TextView text, TextView pattern, size_t from);
 
+// The first tag "<" + name + ">" (or "</" + name + ">" when `closing`) that starts within
+// `window` code units of `from`: what a search for it from `from` finds, when found. npos
+// tells only that none starts that near.
+size_t findTagNear(TextView text, size_t from, size_t window, TextView name, bool closing);
+
 // Speeds up the searches over `text` made on this thread while it is open. The first scope
 // opened on a thread is the one that counts; scopes opened inside it do nothing, and
 // searches of any other text are plain searches. `index`, when given, must be an index of
