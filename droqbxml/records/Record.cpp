@@ -106,7 +106,7 @@ void Record::setFieldValue(size_t index, Text value) {
     fieldStored(index);
     return;
   }
-  if (row.trim == Trim::Spaces) {
+  if (row.trim == Trim::Spaces && !value.empty()) {
     const TextView kept = trimView(value);
     if (kept.size() != value.size()) value = Text(kept);
   }
