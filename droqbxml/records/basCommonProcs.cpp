@@ -95,6 +95,11 @@ ByIndex byIndex(const Text& value, TextView name, size_t from) {
 
 }  // namespace
 
+bool elementAbsent(const Text& Value, TextView ElementName, int32_t EndPoint) {
+  return EndPoint >= 1 &&
+         byIndex(Value, ElementName, static_cast<size_t>(EndPoint - 1)) == ByIndex::Absent;
+}
+
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {
   if (start < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   if (static_cast<size_t>(start) > text.size() + 1) return 0;

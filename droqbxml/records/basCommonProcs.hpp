@@ -26,6 +26,10 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail);
 
+// Whether the read's index shows at once that getElementValue(Value, ElementName, ...,
+// EndPoint, ...) finds nothing: it would return "" with StartPoint = EndPoint.
+bool elementAbsent(const Text& Value, TextView ElementName, int32_t EndPoint);
+
 // The first 1-based position of `what` at or after `start` in `text`, 0 when absent: the
 // platform's InStr over response text, answered from the tag index when `what` is a tag.
 int32_t findInResponse(int32_t start, const Text& text, TextView what);
