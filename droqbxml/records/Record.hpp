@@ -285,17 +285,18 @@ namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
+  const TextView name = record_.fieldSpecs()[index].name;
+  const auto shown = basCommonProcs::shownByIndex(value_, name, end_);
   // Most fields are absent from a response: an optional one the index shows absent is
   // stored empty at once (a required one goes on to its error).
-  if (!isRequired &&
-      basCommonProcs::elementAbsent(value_, record_.fieldSpecs()[index].name, end_)) {
+  if (shown == basCommonProcs::Shown::Absent && !isRequired) {
     start_ = end_;
     record_.setFieldValue(index, Text());
     return;
   }
   record_.setFieldValue(
-      index, basCommonProcs::getElementValue(value_, record_.fieldSpecs()[index].name, start_, end_,
-                                             isRequired, parent_, parentTail_));
+      index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
+                                             parentTail_, shown));
 }
 
 }  // namespace droqbxml

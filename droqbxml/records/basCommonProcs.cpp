@@ -79,25 +79,18 @@ size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
   return spaced;
 }
 
-// What the read's index (when it has one) shows at once of an element read from 0-based
-// `from`: that no "/>" ends within the self-closing window, and then whether the text holds
-// no start tag "<N>" either (the element is absent).
-enum class ByIndex : uint8_t { Unknown, NotSelfClosed, Absent };
-ByIndex byIndex(const Text& value, TextView name, size_t from) {
-  const internal::TagIndex* index = internal::SearchScope::indexOf(value);
-  if (index == nullptr || from > value.size()) return ByIndex::Unknown;
-  const size_t close = index->findSelfClose(from);
-  if (close != TextView::npos && close + 2 <= std::min(value.size(), from + kSelfClosingWindow)) {
-    return ByIndex::Unknown;
-  }
-  return index->lacks(name) ? ByIndex::Absent : ByIndex::NotSelfClosed;
-}
-
 }  // namespace
 
-bool elementAbsent(const Text& Value, TextView ElementName, int32_t EndPoint) {
-  return EndPoint >= 1 &&
-         byIndex(Value, ElementName, static_cast<size_t>(EndPoint - 1)) == ByIndex::Absent;
+Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint) {
+  const internal::TagIndex* index = internal::SearchScope::indexOf(Value);
+  if (index == nullptr || EndPoint < 1) return Shown::Nothing;
+  const auto from = static_cast<size_t>(EndPoint - 1);
+  if (from > Value.size()) return Shown::Nothing;
+  const size_t close = index->findSelfClose(from);
+  if (close != TextView::npos && close + 2 <= std::min(Value.size(), from + kSelfClosingWindow)) {
+    return Shown::Nothing;
+  }
+  return index->lacks(ElementName) ? Shown::Absent : Shown::NotSelfClosed;
 }
 
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {
@@ -114,17 +107,23 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail) {
+  // Most elements a record asks for are absent from the response: the index tells.
+  return getElementValue(Value, ElementName, StartPoint, EndPoint, Required, Parent, ParentTail,
+                         shownByIndex(Value, ElementName, EndPoint));
+}
+
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,
+                     Shown shown) {
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
   Text result;
-  // Most elements a record asks for are absent from the response: the index tells.
-  const ByIndex known = byIndex(Value, ElementName, from);
-  if (known == ByIndex::Absent) {
+  if (shown == Shown::Absent) {
     StartPoint = cursor;
   } else {
     ElementTags tags(ElementName);
-    if (known == ByIndex::Unknown && from <= Value.size()) {
+    if (shown == Shown::Nothing && from <= Value.size()) {
       const size_t at = selfClosingAt(Value, from, tags.start().substr(0, ElementName.size() + 1));
       if (at != Text::npos) {
         // Empty by its form: the required test is not made.

@@ -26,9 +26,16 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail);
 
-// Whether the read's index shows at once that getElementValue(Value, ElementName, ...,
-// EndPoint, ...) finds nothing: it would return "" with StartPoint = EndPoint.
-bool elementAbsent(const Text& Value, TextView ElementName, int32_t EndPoint);
+// What the read's index (when it has one) shows at once of getElementValue(Value,
+// ElementName, ..., EndPoint, ...): nothing; that no "/>" ends within the self-closing
+// window; or that, besides, the text holds no "<N>" (the read gives "" and StartPoint =
+// EndPoint).
+enum class Shown : uint8_t { Nothing, NotSelfClosed, Absent };
+Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint);
+// getElementValue told what shownByIndex gave for the same text, name and cursor.
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,
+                     Shown shown);
 
 // The first 1-based position of `what` at or after `start` in `text`, 0 when absent: the
 // platform's InStr over response text, answered from the tag index when `what` is a tag.
