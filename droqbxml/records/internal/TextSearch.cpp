@@ -99,11 +99,8 @@ constexpr size_t kIndexedSize = 8192;
 
 SearchScope::SearchScope(const Text& text, const TagIndex* index) {
   if (openScope != nullptr) return;
-  thread_local std::vector<uint32_t> hints;
-  hints.clear();
   text_ = &text;
   index_ = index;
-  hints_ = &hints;
   openScope = this;
 }
 
@@ -150,7 +147,7 @@ size_t SearchScope::search(TextView pattern, size_t from) {
   size_t end = std::min(text.size(), from + kNear);
   at = findForward(text.substr(0, end), pattern, from);
   if (at != TextView::npos || end == text.size()) return at;
-  if (group != TagIndex::kNone) return index_->findIn(group, from, hints_);
+  if (group != TagIndex::kNone) return index_->findIn(group, from, &hints_);
   if (index_ == nullptr && (selfClose || (shaped && TagIndex::covers(pattern))) &&
       text.size() >= kIndexedSize && text.size() <= UINT32_MAX) {
     // Not found nearby: a little further, else (it is far or absent) index the text for
@@ -162,7 +159,7 @@ size_t SearchScope::search(TextView pattern, size_t from) {
     if (at != TextView::npos || end == text.size()) return at;
     ownIndex_ = std::make_unique<TagIndex>(text);
     index_ = ownIndex_.get();
-    return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from, hints_);
+    return selfClose ? index_->findSelfClose(from) : index_->find(pattern, from, &hints_);
   }
   if (!answers_.empty() && remembered(pattern, from, at)) return at;
   at = findForward(text, pattern, from);

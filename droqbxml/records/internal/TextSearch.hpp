@@ -92,9 +92,7 @@ class SearchScope {
   const TagIndex* index_ = nullptr;
   std::unique_ptr<TagIndex> ownIndex_;
   std::unordered_map<Text, Answer, Hash, std::equal_to<>> answers_;
-  // The index's notes of this read's searches: the thread's one buffer (only one scope
-  // counts on a thread at a time), emptied when the scope opens.
-  std::vector<uint32_t>* hints_ = nullptr;
+  std::vector<uint32_t> hints_;  // the index's notes of this read's searches
   Text last_;  // the pattern of the answer last remembered or recalled, checked first
   Answer lastAnswer_{TextView::npos, 0};  // answers nothing
 };
