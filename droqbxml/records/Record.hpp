@@ -167,6 +167,12 @@ class Record : public Object {
   Text fieldValueUnescaped(size_t index) const;
   // Trim, check and store by the field's row; rules and the record's hooks apply.
   void setFieldValue(size_t index, Text value);
+  // setFieldValue(index, "") (an absent element read): nothing to trim or check.
+  void setFieldEmpty(size_t index) {
+    if (fields_[index].rule != Rule::None) return setFieldValue(index, Text());
+    values_[index].clear();
+    fieldStored(index);
+  }
 
   std::span<const FieldSpec> fieldSpecs() const noexcept { return fields_; }
 
@@ -291,7 +297,7 @@ void FieldReader<Derived>::read(size_t index, bool isRequired) {
   // stored empty at once (a required one goes on to its error).
   if (shown == basCommonProcs::Shown::Absent && !isRequired) {
     start_ = end_;
-    record_.setFieldValue(index, Text());
+    record_.setFieldEmpty(index);
     return;
   }
   record_.setFieldValue(

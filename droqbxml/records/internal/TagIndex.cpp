@@ -241,9 +241,4 @@ size_t TagIndex::findIn(uint32_t group, size_t from, std::vector<uint32_t>* hint
   return found == end ? TextView::npos : *found;
 }
 
-size_t TagIndex::findSelfClose(size_t from) const {
-  const auto found = std::lower_bound(selfCloses_.begin(), selfCloses_.end(), from);
-  return found == selfCloses_.end() ? TextView::npos : *found;
-}
-
 }  // namespace droqbxml::internal

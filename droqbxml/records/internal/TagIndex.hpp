@@ -8,6 +8,7 @@
 #ifndef DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
 #define DROQBXML_RECORDS_INTERNAL_TAGINDEX_HPP_
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
@@ -58,7 +59,11 @@ class TagIndex {
 
   // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).
   static constexpr TextView kSelfClose = u"/>";
-  size_t findSelfClose(size_t from) const;
+  size_t findSelfClose(size_t from) const {
+    // Responses seldom hold one: most reads end at the first test.
+    if (selfCloses_.empty() || selfCloses_.back() < from) return TextView::npos;
+    return *std::lower_bound(selfCloses_.begin(), selfCloses_.end(), from);
+  }
 
  private:
   struct Slot {
