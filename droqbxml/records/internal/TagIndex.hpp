@@ -33,24 +33,21 @@ class TagIndex {
   // The same of a name: whether the index answers for "<" + name + ">".
   static bool coversName(TextView name);
 
-  // For a covered pattern: exactly text.find(pattern, from) of the indexed text; whether
-  // the text holds it anywhere. `hints`, when given, are the caller's notes of where its
-  // last search for each tag ended (empty at first; the search keeps them): a search from
-  // further on then costs what the distance does, not the tag's count.
+  // For a covered pattern: exactly text.find(pattern, from) of the indexed text. `hints`, when
+  // given, are the caller's notes of where its last search for each tag ended (empty at first; the
+  // search keeps them): a search from further on then costs what the distance does, not the tag's
+  // count.
   size_t find(TextView pattern, size_t from, std::vector<uint32_t>* hints = nullptr) const {
     return findIn(tagGroup(pattern), from, hints);
   }
-  bool holds(TextView pattern) const { return tagGroup(pattern) != kNone; }
 
   // The same in two steps, for a caller that asks about a pattern before it searches: the
   // group of a pattern "<" + name + ">" (kNone when the text holds no such start tag; the
   // pattern is then covered or not), and the search in that group.
   static constexpr uint32_t kNone = UINT32_MAX;
   uint32_t tagGroup(TextView pattern) const {
-    return nameGroup(pattern.substr(1, pattern.size() - 2));
+    return findGroup(pattern.substr(1, pattern.size() - 2));
   }
-  // The group of the start tags of a (non-empty) name, or kNone.
-  uint32_t nameGroup(TextView name) const { return findGroup(name); }
   // Whether the index answers for "<" + name + ">" and the text holds it nowhere.
   bool lacks(TextView name) const {
     return !name.empty() && findGroup(name) == kNone && coversName(name);
