@@ -6,7 +6,7 @@ The benchmark program runs twice: with glibc's mmap threshold off (every large b
 from the heap), and with the heap also kept between rounds (glibc otherwise hands freed
 memory at the top of the heap back to the kernel, so each round pays the page faults of
 its large results again). Both columns are printed; a verdict says which of them meet the target.
-Usage: bench-table.py BENCH_BINARY [--filter REGEX]
+Usage: bench-table.py BENCH_BINARY [--benchmark_filter=REGEX]
 """
 import json
 import os

@@ -8,6 +8,7 @@
 #ifndef DROQBXML_RECORDS_RECORD_HPP_
 #define DROQBXML_RECORDS_RECORD_HPP_
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <cstdint>
@@ -15,6 +16,7 @@
 #include <string_view>
 #include <vector>
 
+#include "droqbxml/records/basCommonProcs.hpp"
 #include "droqbxml/runtime/Binding.hpp"
 #include "droqbxml/runtime/ComError.hpp"
 #include "droqbxml/runtime/Object.hpp"
@@ -262,6 +264,7 @@ class FieldReader {
   int32_t& end_;
   TextView parent_;
   TextView parentTail_;
+  basCommonProcs::CursorView cursor_;
 };
 
 // Builds a text dump: the heading, then label and TAB-indented value lines and framed
@@ -285,24 +288,32 @@ class DumpWriter {
 
 }  // namespace droqbxml
 
-#include "droqbxml/records/basCommonProcs.hpp"
-
 namespace droqbxml {
 
 template <class Derived>
 void FieldReader<Derived>::read(size_t index, bool isRequired) {
-  const TextView name = record_.fieldSpecs()[index].name;
-  const auto shown = basCommonProcs::shownByIndex(value_, name, end_);
-  // Most fields are absent from a response: an optional one the index shows absent is
-  // stored empty at once (a required one goes on to its error).
-  if (shown == basCommonProcs::Shown::Absent && !isRequired) {
+  static_assert(
+      std::ranges::all_of(Derived::kFields,
+                          [](const FieldSpec& f) { return basCommonProcs::isPlainName(f.name); }),
+      "a record's field names are plain XML names");
+  const TextView name = Derived::kFields[index].name;
+  const auto [shown, startTag] = cursor_.look(value_, name, end_);
+  if (startTag != Text::npos) {
+    record_.setFieldValue(
+        index, basCommonProcs::getElementValueAt(value_, name, startTag, start_, end_, isRequired,
+                                                 parent_, parentTail_));
+  } else if (shown == basCommonProcs::Shown::Absent && !isRequired) {
+    // Most fields are absent from a response: an optional one the index shows absent is
+    // stored empty at once (a required one goes on to its error).
     start_ = end_;
     record_.setFieldEmpty(index);
     return;
+  } else {
+    record_.setFieldValue(
+        index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
+                                               parentTail_, shown));
   }
-  record_.setFieldValue(
-      index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
-                                             parentTail_, shown));
+  cursor_.read(value_, name, end_);
 }
 
 }  // namespace droqbxml

@@ -50,11 +50,11 @@ class ElementTags {
   char16_t onStack_[128];
 };
 
-[[noreturn]] void raiseEmptyElementError(const Text& path, TextView source) {
+[[noreturn]] void raiseEmptyElementError(TextView parent, TextView parentTail, TextView name) {
   // "a an" is the text hosts have always matched on.
-  raiseComponentError(PARING, Text(source),
-                      u"The response returned a an empty '" + path +
-                          u"'.\r\nThis element is not allowed to be empty.");
+  raiseComponentError(PARING, u"DroQbXml.basCommonProcs.getElementValue",
+                      u"The response returned a an empty '" + Text(parent) + Text(parentTail) +
+                          u"<" + Text(name) + u">'.\r\nThis element is not allowed to be empty.");
 }
 
 // The first "<N/>", else the first "<N />", lying wholly inside the window at the cursor:
@@ -79,18 +79,64 @@ size_t selfClosingAt(const Text& value, size_t cursor, TextView open) {
   return spaced;
 }
 
+// The index when it shows that no "/>" ends within the self-closing window at the cursor.
+const internal::TagIndex* indexNotSelfClosed(const Text& value, int32_t cursor) {
+  const internal::TagIndex* index = internal::SearchScope::indexOf(value);
+  if (index == nullptr || cursor < 1) return nullptr;
+  const auto from = static_cast<size_t>(cursor - 1);
+  if (from > value.size()) return nullptr;
+  const size_t close = index->findSelfClose(from);
+  if (close != TextView::npos && close + 2 <= std::min(value.size(), from + kSelfClosingWindow)) {
+    return nullptr;
+  }
+  return index;
+}
+
 }  // namespace
 
 Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint) {
-  const internal::TagIndex* index = internal::SearchScope::indexOf(Value);
-  if (index == nullptr || EndPoint < 1) return Shown::Nothing;
-  const auto from = static_cast<size_t>(EndPoint - 1);
-  if (from > Value.size()) return Shown::Nothing;
-  const size_t close = index->findSelfClose(from);
-  if (close != TextView::npos && close + 2 <= std::min(Value.size(), from + kSelfClosingWindow)) {
-    return Shown::Nothing;
-  }
+  const internal::TagIndex* index = indexNotSelfClosed(Value, EndPoint);
+  if (index == nullptr) return Shown::Nothing;
   return index->lacks(ElementName) ? Shown::Absent : Shown::NotSelfClosed;
+}
+
+CursorView::Look CursorView::look(const Text& value, TextView name, int32_t cursor) {
+  if (cursor != cursor_) {
+    cursor_ = cursor;
+    index_ = indexNotSelfClosed(value, cursor);
+    opening_ = Text::npos;
+    if (index_ != nullptr && cursor == endTagAt_) {
+      // Past the end tag, blanks, then the next tag: the first '<' from the cursor on
+      // besides the end tag's own.
+      const size_t end = std::min(value.size() - 1, afterEndTag_ + kNearby);
+      size_t at = afterEndTag_;
+      while (at < end && (value[at] == u'\n' || value[at] == u'\r' || value[at] == u' ' ||
+                          value[at] == u'\t')) {
+        ++at;
+      }
+      if (at < end && value[at] == u'<' && value[at + 1] != u'/') opening_ = at;
+    }
+  }
+  if (index_ == nullptr) return {Shown::Nothing, Text::npos};
+  const size_t n = name.size();
+  if (opening_ != Text::npos && opening_ + n + 2 <= value.size() &&
+      value[opening_ + n + 1] == u'>' &&
+      internal::sameUnits(value.data() + opening_ + 1, name.data(), n)) {
+    return {Shown::NotSelfClosed, opening_};
+  }
+  return {index_->lacksPlain(name) ? Shown::Absent : Shown::NotSelfClosed, Text::npos};
+}
+
+void CursorView::read(const Text& value, TextView name, int32_t endPoint) {
+  const size_t n = name.size();
+  endTagAt_ = 0;
+  if (endPoint < 1) return;
+  const auto at = static_cast<size_t>(endPoint - 1);
+  if (at + n + 3 <= value.size() && value[at] == u'<' && value[at + 1] == u'/' &&
+      value[at + n + 2] == u'>' && internal::sameUnits(value.data() + at + 2, name.data(), n)) {
+    endTagAt_ = endPoint;
+    afterEndTag_ = at + n + 3;
+  }
 }
 
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {
@@ -118,10 +164,7 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
   const int32_t cursor = EndPoint;
   if (cursor < 1) raiseRuntimeError(RuntimeError::kInvalidProcedureCall);
   const auto from = static_cast<size_t>(cursor - 1);
-  Text result;
-  if (shown == Shown::Absent) {
-    StartPoint = cursor;
-  } else {
+  if (shown != Shown::Absent) {
     ElementTags tags(ElementName);
     if (shown == Shown::Nothing && from <= Value.size()) {
       const size_t at = selfClosingAt(Value, from, tags.start().substr(0, ElementName.size() + 1));
@@ -132,28 +175,36 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
         return {};
       }
     }
-    // Elements mostly stand where the cursor is, and their end tags after their text.
+    // Elements mostly stand where the cursor is.
     const size_t near = internal::findTagNear(Value, from, kNearby, ElementName, false);
     const int32_t start = near != TextView::npos ? static_cast<int32_t>(near + 1)
                                                  : findInResponse(cursor, Value, tags.start());
     if (start > 0) {
-      StartPoint = start + static_cast<int32_t>(ElementName.size()) + 2;
-      const size_t close = internal::findTagNear(Value, static_cast<size_t>(StartPoint - 1),
-                                                 kNearby, ElementName, true);
-      EndPoint = close != TextView::npos ? static_cast<int32_t>(close + 1)
-                                         : findInResponse(StartPoint, Value, tags.end());
-      if (EndPoint > 0) {
-        result = Value.substr(static_cast<size_t>(StartPoint - 1),
-                              static_cast<size_t>(EndPoint - StartPoint));
-      }
-    } else {
-      StartPoint = cursor;
+      return getElementValueAt(Value, ElementName, static_cast<size_t>(start - 1), StartPoint,
+                               EndPoint, Required, Parent, ParentTail);
     }
   }
-  if (result.empty() && Required) {
-    raiseEmptyElementError(Text(Parent) + Text(ParentTail) + u"<" + Text(ElementName) + u">",
-                           u"DroQbXml.basCommonProcs.getElementValue");
+  StartPoint = cursor;
+  if (Required) raiseEmptyElementError(Parent, ParentTail, ElementName);
+  return {};
+}
+
+Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
+                       int32_t& StartPoint, int32_t& EndPoint, bool Required, TextView Parent,
+                       TextView ParentTail) {
+  Text result;
+  StartPoint = static_cast<int32_t>(startTag + ElementName.size() + 3);
+  // End tags mostly stand just after their text.
+  const size_t close =
+      internal::findTagNear(Value, static_cast<size_t>(StartPoint - 1), kNearby, ElementName, true);
+  EndPoint = close != TextView::npos
+                 ? static_cast<int32_t>(close + 1)
+                 : findInResponse(StartPoint, Value, ElementTags(ElementName).end());
+  if (EndPoint > 0) {
+    result = Value.substr(static_cast<size_t>(StartPoint - 1),
+                          static_cast<size_t>(EndPoint - StartPoint));
   }
+  if (result.empty() && Required) raiseEmptyElementError(Parent, ParentTail, ElementName);
   return result;
 }
 

@@ -7,6 +7,10 @@
 
 #include "droqbxml/runtime/Text.hpp"
 
+namespace droqbxml::internal {
+class TagIndex;
+}
+
 namespace droqbxml::basCommonProcs {
 
 // Reads element ElementName from Value, searching from the cursor EndPoint (1-based).
@@ -32,6 +36,47 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 // EndPoint).
 enum class Shown : uint8_t { Nothing, NotSelfClosed, Absent };
 Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint);
+// Whether `name` is made of XML name characters only, as every record's table names are.
+// The index answers for such a name without looking at its characters.
+constexpr bool isPlainName(TextView name) {
+  const auto letter = [](char16_t c) {
+    return (c >= u'A' && c <= u'Z') || (c >= u'a' && c <= u'z') || c == u'_' || c == u':';
+  };
+  if (name.empty() || !letter(name.front())) return false;
+  for (const char16_t c : name) {
+    if (!letter(c) && !(c >= u'0' && c <= u'9') && c != u'.' && c != u'-') return false;
+  }
+  return true;
+}
+
+// getElementValue once its start tag "<N>" has been found at 0-based position startTag.
+Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
+                       int32_t& StartPoint, int32_t& EndPoint, bool Required, TextView Parent,
+                       TextView ParentTail);
+
+// What a record's reader knows of the text at its cursor, looked at once while the cursor
+// stays there (an absent field leaves it where it is). Reads of one text only.
+class CursorView {
+ public:
+  struct Look {
+    Shown shown;
+    // "<N>" when it is the first start tag at the cursor (so the first "<N>" from it on),
+    // else Text::npos.
+    size_t startTag;
+  };
+  // shownByIndex for a plain name at the cursor, and where its start tag is when the
+  // cursor stands at the end tag of the last field read and the element after it is N.
+  Look look(const Text& value, TextView name, int32_t cursor);
+  // Tells that field `name` was read and left its EndPoint there.
+  void read(const Text& value, TextView name, int32_t endPoint);
+
+ private:
+  int32_t cursor_ = 0;
+  const internal::TagIndex* index_ = nullptr;
+  size_t opening_ = Text::npos;
+  int32_t endTagAt_ = 0;  // the cursor at a known "</N>", else 0
+  size_t afterEndTag_ = 0;
+};
 // getElementValue told what shownByIndex gave for the same text, name and cursor.
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,

@@ -28,12 +28,13 @@ class RandomBatch {
         case 0:
           text += u"<CustomerQueryRs requestID=\"" + id + u"\"><CustomerRet>" + header() +
                   maybe(u"CompanyName") + maybe(u"Phone") + maybe(u"Mobile") +
-                  maybe(u"BillAddress", maybe(u"Addr1") + maybe(u"City")) + maybe(u"Balance") +
-                  maybe(u"JobStatus", u"Closed") + u"</CustomerRet></CustomerQueryRs>";
+                  maybe(u"BillAddress", maybe(u"Addr1") + maybe(u"City")) +
+                  maybe(u"Balance", u"12.50") + maybe(u"JobStatus", u"Closed") +
+                  u"</CustomerRet></CustomerQueryRs>";
           break;
         case 1:
           text += u"<AccountQueryRs requestID=\"" + id + u"\"><AccountRet>" + header() +
-                  maybe(u"AccountType", u"Bank") + maybe(u"Desc") + maybe(u"Balance") +
+                  maybe(u"AccountType", u"Bank") + maybe(u"Desc") + maybe(u"Balance", u"12.50") +
                   u"</AccountRet></AccountQueryRs>";
           break;
         default:
@@ -47,10 +48,10 @@ class RandomBatch {
 
  private:
   Text header() {
-    return maybe(u"ListID", u"80-1") + maybe(u"TimeCreated", u"2026-11-25T08:00:00") +
-           maybe(u"TimeModified", u"2026-11-25T08:00:00") + maybe(u"EditSequence", u"7") +
-           maybe(u"Name") + maybe(u"FullName") + maybe(u"IsActive", u"true") +
-           maybe(u"Sublevel", u"0");
+    return often(u"ListID", u"80-1") + often(u"TimeCreated", u"2026-11-25T08:00:00") +
+           often(u"TimeModified", u"2026-11-25T08:00:00") + often(u"EditSequence", u"7") +
+           often(u"Name") + often(u"FullName") + often(u"IsActive", u"true") +
+           often(u"Sublevel", u"0");
   }
   Text lines() {
     Text text;
@@ -62,9 +63,24 @@ class RandomBatch {
     return text;
   }
   // The element with a value, empty, self-closed (with or without the blank), with an
-  // attribute, or absent.
-  Text maybe(const Text& tag, const Text& value = u"v") {
-    switch (random_() % 7) {
+  // attribute, or absent; after blanks, sometimes more than a read looks past.
+  Text maybe(const Text& tag, const Text& value = {}) { return form(tag, value, random_() % 7); }
+  // A header element: mostly plain, so that most reads get past the header.
+  Text often(const Text& tag, const Text& value = {}) {
+    return form(tag, value, random_() % 8 == 0 ? random_() % 7 : 5);
+  }
+  // Values default to one of their own, so a value read from the wrong element shows.
+  Text form(const Text& tag, const Text& value, unsigned kind) {
+    const Text own = value.empty() ? u"v" + asciiText(std::to_string(++made_)) : value;
+    const Text lead = blanks();
+    return lead + element(tag, own, kind);
+  }
+  Text blanks() {
+    static const Text kBlanks[] = {u"", u"\r\n", u"\n\t", Text(70, u' ')};
+    return kBlanks[random_() % 4];
+  }
+  Text element(const Text& tag, const Text& value, unsigned form) {
+    switch (form) {
       case 0:
         return u"<" + tag + u"></" + tag + u">";
       case 1:
@@ -81,6 +97,7 @@ class RandomBatch {
   }
 
   std::mt19937 random_;
+  int made_ = 0;
 };
 
 // What a read left behind: its result and the record's values, or the error it raised.

@@ -52,6 +52,8 @@ class TagIndex {
   bool lacks(TextView name) const {
     return !name.empty() && findGroup(name) == kNone && coversName(name);
   }
+  // The same for a name the index is known to answer for (see basCommonProcs::isPlainName).
+  bool lacksPlain(TextView name) const { return findGroup(name) == kNone; }
   size_t findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints = nullptr) const;
 
   // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).

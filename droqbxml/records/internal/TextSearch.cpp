@@ -45,27 +45,30 @@ size_t findPair(const char16_t* data, size_t at, size_t last, char16_t first, ch
 size_t findTagNear(TextView text, size_t from, size_t window, TextView name, bool closing) {
   const size_t end = std::min(text.size(), from + window);
   const char16_t* data = text.data();
-  const size_t length = name.size() + (closing ? 3 : 2);
-  for (size_t at = from; at < end; ++at) {
+  const size_t n = name.size();
+  const size_t length = n + (closing ? 3 : 2);
+  // The unit after '<' that the tag needs: '/' for an end tag, else the name's first.
+  const char16_t second = closing ? u'/' : n > 0 ? name[0] : u'>';
+  const auto matches = [&](size_t at) {
+    return at + length <= text.size() && data[at + 1] == second && data[at + length - 1] == u'>' &&
+           sameUnits(data + at + length - 1 - n, name.data(), n);
+  };
+  size_t at = from;
 #if defined(__SSE2__)
-    // The next '<', eight units at a time.
-    const __m128i open = _mm_set1_epi16(static_cast<int16_t>(u'<'));
-    for (; at + 8 <= end; at += 8) {
-      const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at));
-      const int mask = _mm_movemask_epi8(_mm_cmpeq_epi16(units, open));
-      if (mask != 0) {
-        at += static_cast<size_t>(__builtin_ctz(static_cast<unsigned>(mask))) / 2;
-        break;
-      }
+  // Each '<' of eight units at a time.
+  const __m128i open = _mm_set1_epi16(static_cast<int16_t>(u'<'));
+  for (; at + 8 <= end; at += 8) {
+    const __m128i units = _mm_loadu_si128(reinterpret_cast<const __m128i*>(data + at));
+    for (auto mask = static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi16(units, open)));
+         mask != 0; mask &= mask - 1) {
+      const size_t candidate = at + static_cast<size_t>(__builtin_ctz(mask)) / 2;
+      mask &= mask - 1;  // the pair of bits of one unit
+      if (matches(candidate)) return candidate;
     }
-    if (at >= end) break;
+  }
 #endif
-    if (data[at] != u'<' || at + length > text.size()) continue;
-    const size_t nameAt = at + (closing ? 2 : 1);
-    if ((!closing || data[at + 1] == u'/') && data[at + length - 1] == u'>' &&
-        sameUnits(data + nameAt, name.data(), name.size())) {
-      return at;
-    }
+  for (; at < end; ++at) {
+    if (data[at] == u'<' && matches(at)) return at;
   }
   return TextView::npos;
 }
