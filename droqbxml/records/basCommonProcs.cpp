@@ -50,6 +50,12 @@ class ElementTags {
   char16_t onStack_[128];
 };
 
+// Where a search goes on (1-based) once findTagNear found nothing near `from`: no tag starts
+// before it, so what is found from there is what a search from `from` finds.
+int32_t beyondNear(const Text& value, size_t from) {
+  return static_cast<int32_t>(std::min(value.size(), from + kNearby) + 1);
+}
+
 [[noreturn]] void raiseEmptyElementError(TextView parent, TextView parentTail, TextView name) {
   // "a an" is the text hosts have always matched on.
   raiseComponentError(PARING, u"DroQbXml.basCommonProcs.getElementValue",
@@ -177,8 +183,9 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
     }
     // Elements mostly stand where the cursor is.
     const size_t near = internal::findTagNear(Value, from, kNearby, ElementName, false);
-    const int32_t start = near != TextView::npos ? static_cast<int32_t>(near + 1)
-                                                 : findInResponse(cursor, Value, tags.start());
+    const int32_t start = near != TextView::npos
+                              ? static_cast<int32_t>(near + 1)
+                              : findInResponse(beyondNear(Value, from), Value, tags.start());
     if (start > 0) {
       return getElementValueAt(Value, ElementName, static_cast<size_t>(start - 1), StartPoint,
                                EndPoint, Required, Parent, ParentTail);
@@ -199,7 +206,8 @@ Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
       internal::findTagNear(Value, static_cast<size_t>(StartPoint - 1), kNearby, ElementName, true);
   EndPoint = close != TextView::npos
                  ? static_cast<int32_t>(close + 1)
-                 : findInResponse(StartPoint, Value, ElementTags(ElementName).end());
+                 : findInResponse(beyondNear(Value, static_cast<size_t>(StartPoint - 1)), Value,
+                                  ElementTags(ElementName).end());
   if (EndPoint > 0) {
     result = Value.substr(static_cast<size_t>(StartPoint - 1),
                           static_cast<size_t>(EndPoint - StartPoint));

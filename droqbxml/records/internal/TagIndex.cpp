@@ -214,6 +214,33 @@ TagIndex::TagIndex(TextView text, bool wide) : text_(text) {
   for (const Tag& tag : tags) at_[next[tag.group]++] = tag.at;
 }
 
+namespace {
+
+using Positions = std::vector<uint32_t>::const_iterator;
+
+// The first of the sorted [begin, end) not below `from`, looked for from `at` in steps that
+// double, then by a binary search within the last step.
+Positions gallop(Positions begin, Positions end, Positions at, size_t from) {
+  if (at != end && *at < from) {
+    auto low = at + 1;
+    auto high = low;
+    for (ptrdiff_t step = 1; high != end && *high < from; step *= 2) {
+      low = high + 1;
+      high = end - low > step ? low + step : end;
+    }
+    return std::lower_bound(low, high, from);
+  }
+  auto high = at;  // the answer is here or before
+  for (ptrdiff_t step = 1; high != begin && *(high - 1) >= from; step *= 2) {
+    const auto low = high - begin > step ? high - step : begin;
+    if (*low < from) return std::lower_bound(low + 1, high, from);
+    high = low;
+  }
+  return high;
+}
+
+}  // namespace
+
 size_t TagIndex::findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints) const {
   if (group == kNone) return TextView::npos;
   uint32_t* hint = nullptr;
@@ -223,20 +250,16 @@ size_t TagIndex::findIn(uint32_t group, size_t from, std::vector<uint32_t>* hint
   }
   const auto begin = at_.begin() + starts_[group];
   const auto end = at_.begin() + starts_[group + 1];
-  auto found = end;
-  if (hint == nullptr || *hint < starts_[group] || *hint > starts_[group + 1]) {
-    found = std::lower_bound(begin, end, from);
-  } else if (auto low = at_.begin() + *hint; low > begin && *(low - 1) >= from) {
-    found = std::lower_bound(begin, low, from);  // before the last answer
+  auto at = begin;
+  if (hint != nullptr && *hint >= starts_[group] && *hint <= starts_[group + 1]) {
+    at = at_.begin() + *hint;  // where the read's last search for the name ended
   } else {
-    // From the last answer on, in steps that double, then a binary search in the last.
-    auto high = low;
-    for (ptrdiff_t step = 1; high != end && *high < from; step *= 2) {
-      low = high + 1;
-      high = end - low > step ? low + step : end;
-    }
-    found = std::lower_bound(low, high, from);
+    // Else a guess: the tags of one name mostly spread evenly over a response.
+    const auto count = static_cast<size_t>(end - begin);
+    at += static_cast<ptrdiff_t>(
+        std::min(count, count * std::min(from, text_.size()) / std::max<size_t>(text_.size(), 1)));
   }
+  const auto found = gallop(begin, end, at, from);
   if (hint != nullptr) *hint = static_cast<uint32_t>(found - at_.begin());
   return found == end ? TextView::npos : *found;
 }
