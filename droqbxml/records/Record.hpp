@@ -243,7 +243,9 @@ class FieldReader {
         start_(startPoint),
         end_(endPoint),
         parent_(parent),
-        parentTail_(parentTail) {}
+        parentTail_(parentTail),
+        cursor_(Derived::kFields.data(), Derived::kFields.size(),
+                [](size_t i) { return Derived::kFields[i].name; }) {}
 
   // Each a required element: an empty one raises, naming the parent path.
   template <FieldName... Names>
@@ -297,7 +299,7 @@ void FieldReader<Derived>::read(size_t index, bool isRequired) {
                           [](const FieldSpec& f) { return basCommonProcs::isPlainName(f.name); }),
       "a record's field names are plain XML names");
   const TextView name = Derived::kFields[index].name;
-  const auto [shown, startTag] = cursor_.look(value_, name, end_);
+  const auto [shown, startTag] = cursor_.look(value_, index, end_);
   if (startTag != Text::npos) {
     record_.setFieldValue(
         index, basCommonProcs::getElementValueAt(value_, name, startTag, start_, end_, isRequired,
@@ -313,7 +315,7 @@ void FieldReader<Derived>::read(size_t index, bool isRequired) {
         index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
                                                parentTail_, shown));
   }
-  cursor_.read(value_, name, end_);
+  cursor_.read(value_, index, end_);
 }
 
 }  // namespace droqbxml

@@ -106,34 +106,42 @@ Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint) {
   return index->lacks(ElementName) ? Shown::Absent : Shown::NotSelfClosed;
 }
 
-CursorView::Look CursorView::look(const Text& value, TextView name, int32_t cursor) {
-  if (cursor != cursor_) {
-    cursor_ = cursor;
-    index_ = indexNotSelfClosed(value, cursor);
-    opening_ = Text::npos;
-    if (index_ != nullptr && cursor == endTagAt_) {
-      // Past the end tag, blanks, then the next tag: the first '<' from the cursor on
-      // besides the end tag's own.
-      const size_t end = std::min(value.size() - 1, afterEndTag_ + kNearby);
-      size_t at = afterEndTag_;
-      while (at < end && (value[at] == u'\n' || value[at] == u'\r' || value[at] == u' ' ||
-                          value[at] == u'\t')) {
-        ++at;
-      }
-      if (at < end && value[at] == u'<' && value[at + 1] != u'/') opening_ = at;
-    }
-  }
+CursorView::Look CursorView::look(const Text& value, size_t field, int32_t cursor) {
+  if (cursor != cursor_) moveTo(value, cursor);
   if (index_ == nullptr) return {Shown::Nothing, Text::npos};
+  if (groups_[field] == internal::TagIndex::kNone) return {Shown::Absent, Text::npos};
+  const TextView name = nameAt_(field);
   const size_t n = name.size();
   if (opening_ != Text::npos && opening_ + n + 2 <= value.size() &&
       value[opening_ + n + 1] == u'>' &&
       internal::sameUnits(value.data() + opening_ + 1, name.data(), n)) {
     return {Shown::NotSelfClosed, opening_};
   }
-  return {index_->lacksPlain(name) ? Shown::Absent : Shown::NotSelfClosed, Text::npos};
+  return {Shown::NotSelfClosed, Text::npos};
 }
 
-void CursorView::read(const Text& value, TextView name, int32_t endPoint) {
+void CursorView::moveTo(const Text& value, int32_t cursor) {
+  cursor_ = cursor;
+  index_ = indexNotSelfClosed(value, cursor);
+  opening_ = Text::npos;
+  if (index_ != nullptr && groups_.empty()) {
+    groups_ = internal::SearchScope::groupsOf(*index_, table_, count_, nameAt_);
+  }
+  if (index_ != nullptr && cursor == endTagAt_) {
+    // Past the end tag, blanks, then the next tag: the first '<' from the cursor on
+    // besides the end tag's own.
+    const size_t end = std::min(value.size() - 1, afterEndTag_ + kNearby);
+    size_t at = afterEndTag_;
+    while (at < end &&
+           (value[at] == u'\n' || value[at] == u'\r' || value[at] == u' ' || value[at] == u'\t')) {
+      ++at;
+    }
+    if (at < end && value[at] == u'<' && value[at + 1] != u'/') opening_ = at;
+  }
+}
+
+void CursorView::read(const Text& value, size_t field, int32_t endPoint) {
+  const TextView name = nameAt_(field);
   const size_t n = name.size();
   endTagAt_ = 0;
   if (endPoint < 1) return;

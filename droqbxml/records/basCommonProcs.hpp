@@ -3,7 +3,9 @@
 #ifndef DROQBXML_RECORDS_BASCOMMONPROCS_HPP_
 #define DROQBXML_RECORDS_BASCOMMONPROCS_HPP_
 
+#include <cstddef>
 #include <cstdint>
+#include <span>
 
 #include "droqbxml/runtime/Text.hpp"
 
@@ -55,28 +57,40 @@ Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
                        TextView ParentTail);
 
 // What a record's reader knows of the text at its cursor, looked at once while the cursor
-// stays there (an absent field leaves it where it is). Reads of one text only.
+// stays there (an absent field leaves it where it is). Reads of one text only, within one
+// read (see internal::SearchScope), of the fields of one table of plain names.
 class CursorView {
  public:
+  // The table's names: nameAt(0) .. nameAt(count - 1), `table` telling the table.
+  CursorView(const void* table, size_t count, TextView (*nameAt)(size_t))
+      : table_(table), count_(count), nameAt_(nameAt) {}
+
   struct Look {
     Shown shown;
     // "<N>" when it is the first start tag at the cursor (so the first "<N>" from it on),
     // else Text::npos.
     size_t startTag;
   };
-  // shownByIndex for a plain name at the cursor, and where its start tag is when the
+  // shownByIndex for field `field` at the cursor, and where its start tag is when the
   // cursor stands at the end tag of the last field read and the element after it is N.
-  Look look(const Text& value, TextView name, int32_t cursor);
-  // Tells that field `name` was read and left its EndPoint there.
-  void read(const Text& value, TextView name, int32_t endPoint);
+  Look look(const Text& value, size_t field, int32_t cursor);
+  // Tells that field `field` was read and left its EndPoint there.
+  void read(const Text& value, size_t field, int32_t endPoint);
 
  private:
+  void moveTo(const Text& value, int32_t cursor);
+
+  const void* table_;
+  size_t count_;
+  TextView (*nameAt_)(size_t);
+  std::span<const uint32_t> groups_;  // the fields' groups in the read's index, once it has one
   int32_t cursor_ = 0;
   const internal::TagIndex* index_ = nullptr;
   size_t opening_ = Text::npos;
   int32_t endTagAt_ = 0;  // the cursor at a known "</N>", else 0
   size_t afterEndTag_ = 0;
 };
+
 // getElementValue told what shownByIndex gave for the same text, name and cursor.
 Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
                      int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,

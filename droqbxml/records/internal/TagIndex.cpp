@@ -4,6 +4,7 @@
 #include "droqbxml/records/internal/TagIndex.hpp"
 
 #include <algorithm>
+#include <atomic>
 #include <cstring>
 
 #include "droqbxml/records/internal/TextSearch.hpp"
@@ -189,6 +190,8 @@ uint32_t TagIndex::findGroup(TextView name) const {
 }
 
 TagIndex::TagIndex(TextView text, bool wide) : text_(text) {
+  static std::atomic<uint64_t> made{0};
+  serial_ = ++made;
   slotBits_ = text.size() < 16384 ? 8 : 12;
   slots_.resize(size_t{1} << slotBits_);
   struct Tag {

@@ -52,8 +52,11 @@ class TagIndex {
   bool lacks(TextView name) const {
     return !name.empty() && findGroup(name) == kNone && coversName(name);
   }
-  // The same for a name the index is known to answer for (see basCommonProcs::isPlainName).
-  bool lacksPlain(TextView name) const { return findGroup(name) == kNone; }
+  // The group of a name the index is known to answer for (see basCommonProcs::isPlainName):
+  // kNone when the text holds no "<" + name + ">".
+  uint32_t plainGroup(TextView name) const { return findGroup(name); }
+  // This index among all made in the process: no two have the same.
+  uint64_t serial() const { return serial_; }
   size_t findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints = nullptr) const;
 
   // The "/>" that closes self-closed tags, also indexed: text.find(kSelfClose, from).
@@ -78,6 +81,7 @@ class TagIndex {
   uint32_t findGroup(TextView name) const;
 
   TextView text_;
+  uint64_t serial_ = 0;
   std::vector<Slot> slots_;
   unsigned slotBits_ = 0;
   // Names whose key's slot belongs to another name.

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <deque>
 
 #include "droqbxml/records/internal/TagIndex.hpp"
 
@@ -91,6 +92,17 @@ namespace {
 
 thread_local SearchScope* openScope = nullptr;
 
+// The groups of record tables' names in the indexes read lately on this thread. Entries
+// are only added while a read is open (so the spans handed out stay valid) and cleared
+// between reads once there are many.
+struct TableGroups {
+  uint64_t index = 0;
+  const void* table = nullptr;
+  std::vector<uint32_t> groups;
+};
+thread_local std::deque<TableGroups> tableGroups;
+constexpr size_t kKeptTableGroups = 64;
+
 // Most searches of a read end close to where they start: this many code units from the
 // start are searched directly, before the memory or the index is consulted.
 constexpr size_t kNear = 64;
@@ -102,6 +114,7 @@ constexpr size_t kIndexedSize = 8192;
 
 SearchScope::SearchScope(const Text& text, const TagIndex* index) {
   if (openScope != nullptr) return;
+  if (tableGroups.size() > kKeptTableGroups) tableGroups.clear();
   text_ = &text;
   index_ = index;
   openScope = this;
@@ -127,6 +140,17 @@ const TagIndex* SearchScope::indexOf(const Text& text) {
 bool SearchScope::lacksStartTag(const Text& text, TextView name) {
   const TagIndex* index = indexOf(text);
   return index != nullptr && index->lacks(name);
+}
+
+std::span<const uint32_t> SearchScope::groupsOf(const TagIndex& index, const void* table,
+                                                size_t count, TextView (*nameAt)(size_t)) {
+  for (const TableGroups& known : tableGroups) {
+    if (known.index == index.serial() && known.table == table) return known.groups;
+  }
+  TableGroups& made = tableGroups.emplace_back(TableGroups{index.serial(), table, {}});
+  made.groups.resize(count);
+  for (size_t i = 0; i < count; ++i) made.groups[i] = index.plainGroup(nameAt(i));
+  return made.groups;
 }
 
 size_t SearchScope::search(TextView pattern, size_t from) {

@@ -20,6 +20,7 @@
 #include <cstring>
 #include <functional>
 #include <memory>
+#include <span>
 #include <unordered_map>
 #include <vector>
 
@@ -72,6 +73,11 @@ class SearchScope {
   static const TagIndex* indexOf(const Text& text);
   // Whether that index shows that `text` holds "<" + name + ">" nowhere (false without one).
   static bool lacksStartTag(const Text& text, TextView name);
+  // The groups in `index` of a record table's plain names nameAt(0) .. nameAt(count - 1);
+  // `table` tells the table (the same table, the same names). Looked up once on each thread
+  // for each index and table, and valid until the thread's next read opens a scope.
+  static std::span<const uint32_t> groupsOf(const TagIndex& index, const void* table, size_t count,
+                                            TextView (*nameAt)(size_t));
 
  private:
   size_t search(TextView pattern, size_t from);
