@@ -38,6 +38,11 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 // EndPoint).
 enum class Shown : uint8_t { Nothing, NotSelfClosed, Absent };
 Shown shownByIndex(const Text& Value, TextView ElementName, int32_t EndPoint);
+// getElementValue told what shownByIndex gave for the same text, name and cursor.
+Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
+                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,
+                     Shown shown);
+
 // Whether `name` is made of XML name characters only, as every record's table names are.
 // The index answers for such a name without looking at its characters.
 constexpr bool isPlainName(TextView name) {
@@ -90,11 +95,6 @@ class CursorView {
   int32_t endTagAt_ = 0;  // the cursor at a known "</N>", else 0
   size_t afterEndTag_ = 0;
 };
-
-// getElementValue told what shownByIndex gave for the same text, name and cursor.
-Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoint,
-                     int32_t& EndPoint, bool Required, TextView Parent, TextView ParentTail,
-                     Shown shown);
 
 // The first 1-based position of `what` at or after `start` in `text`, 0 when absent: the
 // platform's InStr over response text, answered from the tag index when `what` is a tag.
