@@ -110,11 +110,7 @@ CursorView::Look CursorView::look(const Text& value, size_t field, int32_t curso
   if (cursor != cursor_) moveTo(value, cursor);
   if (index_ == nullptr) return {Shown::Nothing, Text::npos};
   if (groups_[field] == internal::TagIndex::kNone) return {Shown::Absent, Text::npos};
-  const TextView name = nameAt_(field);
-  const size_t n = name.size();
-  if (opening_ != Text::npos && opening_ + n + 2 <= value.size() &&
-      value[opening_ + n + 1] == u'>' &&
-      internal::sameUnits(value.data() + opening_ + 1, name.data(), n)) {
+  if (opening_ != Text::npos && internal::tagAt(value, opening_, nameAt_(field), false)) {
     return {Shown::NotSelfClosed, opening_};
   }
   return {Shown::NotSelfClosed, Text::npos};
@@ -142,15 +138,12 @@ void CursorView::moveTo(const Text& value, int32_t cursor) {
 
 void CursorView::read(const Text& value, size_t field, int32_t endPoint) {
   const TextView name = nameAt_(field);
-  const size_t n = name.size();
   endTagAt_ = 0;
-  if (endPoint < 1) return;
-  const auto at = static_cast<size_t>(endPoint - 1);
-  if (at + n + 3 <= value.size() && value[at] == u'<' && value[at + 1] == u'/' &&
-      value[at + n + 2] == u'>' && internal::sameUnits(value.data() + at + 2, name.data(), n)) {
-    endTagAt_ = endPoint;
-    afterEndTag_ = at + n + 3;
+  if (endPoint < 1 || !internal::tagAt(value, static_cast<size_t>(endPoint - 1), name, true)) {
+    return;
   }
+  endTagAt_ = endPoint;
+  afterEndTag_ = static_cast<size_t>(endPoint - 1) + name.size() + 3;
 }
 
 int32_t findInResponse(int32_t start, const Text& text, TextView what) {

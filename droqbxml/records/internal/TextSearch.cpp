@@ -46,14 +46,6 @@ size_t findPair(const char16_t* data, size_t at, size_t last, char16_t first, ch
 size_t findTagNear(TextView text, size_t from, size_t window, TextView name, bool closing) {
   const size_t end = std::min(text.size(), from + window);
   const char16_t* data = text.data();
-  const size_t n = name.size();
-  const size_t length = n + (closing ? 3 : 2);
-  // The unit after '<' that the tag needs: '/' for an end tag, else the name's first.
-  const char16_t second = closing ? u'/' : n > 0 ? name[0] : u'>';
-  const auto matches = [&](size_t at) {
-    return at + length <= text.size() && data[at + 1] == second && data[at + length - 1] == u'>' &&
-           sameUnits(data + at + length - 1 - n, name.data(), n);
-  };
   size_t at = from;
 #if defined(__SSE2__)
   // Each '<' of eight units at a time.
@@ -64,12 +56,12 @@ size_t findTagNear(TextView text, size_t from, size_t window, TextView name, boo
          mask != 0; mask &= mask - 1) {
       const size_t candidate = at + static_cast<size_t>(__builtin_ctz(mask)) / 2;
       mask &= mask - 1;  // the pair of bits of one unit
-      if (matches(candidate)) return candidate;
+      if (tagAt(text, candidate, name, closing)) return candidate;
     }
   }
 #endif
   for (; at < end; ++at) {
-    if (data[at] == u'<' && matches(at)) return at;
+    if (tagAt(text, at, name, closing)) return at;
   }
   return TextView::npos;
 }

@@ -46,6 +46,15 @@ inline bool sameUnits(const char16_t* a, const char16_t* b, size_t n) {
   return true;
 }
 
+// Whether "<" + name + ">" (or "</" + name + ">" when `closing`) starts at `at` in `text`.
+inline bool tagAt(TextView text, size_t at, TextView name, bool closing) {
+  const size_t n = name.size();
+  const size_t length = n + (closing ? 3 : 2);
+  if (at + length > text.size() || text[at] != u'<' || text[at + length - 1] != u'>') return false;
+  if (closing && text[at + 1] != u'/') return false;
+  return sameUnits(text.data() + at + length - 1 - n, name.data(), n);
+}
+
 // The first position (0-based) at or after `from` where `pattern` occurs in `text`, or
 // Text::npos: exactly what text.find(pattern, from) gives.
 size_t findForward(TextView text, TextView pattern, size_t from);
