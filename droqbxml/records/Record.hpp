@@ -304,17 +304,19 @@ void FieldReader<Derived>::read(size_t index, bool isRequired) {
     record_.setFieldValue(
         index, basCommonProcs::getElementValueAt(value_, name, startTag, start_, end_, isRequired,
                                                  parent_, parentTail_));
-  } else if (shown == basCommonProcs::Shown::Absent && !isRequired) {
+    cursor_.readToEndTag(name.size(), end_);
+    return;
+  }
+  if (shown == basCommonProcs::Shown::Absent && !isRequired) {
     // Most fields are absent from a response: an optional one the index shows absent is
     // stored empty at once (a required one goes on to its error).
     start_ = end_;
     record_.setFieldEmpty(index);
     return;
-  } else {
-    record_.setFieldValue(
-        index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
-                                               parentTail_, shown));
   }
+  record_.setFieldValue(
+      index, basCommonProcs::getElementValue(value_, name, start_, end_, isRequired, parent_,
+                                             parentTail_, shown));
   cursor_.read(value_, index, end_);
 }
 

@@ -81,6 +81,12 @@ class CursorView {
   Look look(const Text& value, size_t field, int32_t cursor);
   // Tells that field `field` was read and left its EndPoint there.
   void read(const Text& value, size_t field, int32_t endPoint);
+  // The same when EndPoint is known to be at the field's end tag, or 0 (as
+  // getElementValueAt leaves it).
+  void readToEndTag(size_t nameLength, int32_t endPoint) {
+    endTagAt_ = endPoint;
+    afterEndTag_ = static_cast<size_t>(endPoint - 1) + nameLength + 3;
+  }
 
  private:
   void moveTo(const Text& value, int32_t cursor);
