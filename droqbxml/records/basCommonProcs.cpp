@@ -200,7 +200,6 @@ Text getElementValue(const Text& Value, TextView ElementName, int32_t& StartPoin
 Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
                        int32_t& StartPoint, int32_t& EndPoint, bool Required, TextView Parent,
                        TextView ParentTail) {
-  Text result;
   StartPoint = static_cast<int32_t>(startTag + ElementName.size() + 3);
   // End tags mostly stand just after their text.
   const size_t close =
@@ -209,12 +208,12 @@ Text getElementValueAt(const Text& Value, TextView ElementName, size_t startTag,
                  ? static_cast<int32_t>(close + 1)
                  : findInResponse(beyondNear(Value, static_cast<size_t>(StartPoint - 1)), Value,
                                   ElementTags(ElementName).end());
-  if (EndPoint > 0) {
-    result = Value.substr(static_cast<size_t>(StartPoint - 1),
-                          static_cast<size_t>(EndPoint - StartPoint));
+  // The end tag is found from the content's start, so it never stands before it.
+  if (EndPoint > StartPoint) {
+    return Text(Value.data() + StartPoint - 1, static_cast<size_t>(EndPoint - StartPoint));
   }
-  if (result.empty() && Required) raiseEmptyElementError(Parent, ParentTail, ElementName);
-  return result;
+  if (Required) raiseEmptyElementError(Parent, ParentTail, ElementName);
+  return {};
 }
 
 }  // namespace droqbxml::basCommonProcs
