@@ -244,6 +244,8 @@ Positions gallop(Positions begin, Positions end, Positions at, size_t from) {
 
 }  // namespace
 
+TagIndex::~TagIndex() { SearchScope::forget(*this); }
+
 size_t TagIndex::findIn(uint32_t group, size_t from, std::vector<uint32_t>* hints) const {
   if (group == kNone) return TextView::npos;
   uint32_t* hint = nullptr;

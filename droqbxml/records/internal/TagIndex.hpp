@@ -25,6 +25,9 @@ class TagIndex {
   // change: the index answers for that text only. Without `wide` the scan keeps to SSE2
   // even where the processor has AVX2 (the tests compare both).
   explicit TagIndex(TextView text, bool wide = true);
+  ~TagIndex();
+  TagIndex(const TagIndex&) = delete;
+  TagIndex& operator=(const TagIndex&) = delete;
 
   // Whether the index answers searches for `pattern`: "<" + name + ">" where the name is
   // not empty, holds no '<' or '>', does not start with '/', '?' or '!' and does not end

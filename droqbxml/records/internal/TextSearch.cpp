@@ -145,6 +145,12 @@ std::span<const uint32_t> SearchScope::groupsOf(const TagIndex& index, const voi
   return made.groups;
 }
 
+void SearchScope::forget(const TagIndex& index) {
+  if (openScope != nullptr) return;
+  std::erase_if(tableGroups,
+                [&](const TableGroups& known) { return known.index == index.serial(); });
+}
+
 size_t SearchScope::search(TextView pattern, size_t from) {
   const TextView text = *text_;
   size_t at = TextView::npos;

@@ -87,6 +87,9 @@ class SearchScope {
   // for each index and table, and valid until the thread's next read opens a scope.
   static std::span<const uint32_t> groupsOf(const TagIndex& index, const void* table, size_t count,
                                             TextView (*nameAt)(size_t));
+  // Drops what this thread keeps of an index that goes, when no read is open on it (small
+  // blocks kept past a large response's end would hold the heap's top in place).
+  static void forget(const TagIndex& index);
 
  private:
   size_t search(TextView pattern, size_t from);
